@@ -1,0 +1,269 @@
+#include "Values.h"
+
+#include "Names.h"
+#include "WbemText.h"
+
+#include <array>
+
+namespace host
+{
+
+Value Value::nullOf(CMPIType type)
+{
+    Value v;
+    v.type = storedType(type);
+    v.null = true;
+    return v;
+}
+
+Value Value::boolean(bool value)
+{
+    Value v;
+    v.type = CMPI_boolean;
+    v.u = value ? 1 : 0;
+    return v;
+}
+
+Value Value::unsignedInt(CMPIType type, std::uint64_t value)
+{
+    Value v;
+    v.type = type;
+    v.u = value;
+    return v;
+}
+
+Value Value::signedInt(CMPIType type, std::int64_t value)
+{
+    Value v;
+    v.type = type;
+    v.s = value;
+    return v;
+}
+
+Value Value::real(CMPIType type, double value)
+{
+    Value v;
+    v.type = type;
+    v.r = value;
+    return v;
+}
+
+Value Value::string(std::string value)
+{
+    Value v;
+    v.type = CMPI_string;
+    v.text = std::move(value);
+    return v;
+}
+
+Value Value::dateTime(std::string cimText)
+{
+    Value v;
+    v.type = CMPI_dateTime;
+    v.text = std::move(cimText);
+    return v;
+}
+
+Value Value::reference(ObjectPath path)
+{
+    Value v;
+    v.type = CMPI_ref;
+    v.ref = std::make_shared<ObjectPath>(std::move(path));
+    return v;
+}
+
+Value Value::array(CMPIType elementType, std::vector<Value> elements)
+{
+    Value v;
+    v.type = static_cast<CMPIType>(storedType(elementType) | CMPI_ARRAY);
+    v.elements = std::move(elements);
+    return v;
+}
+
+std::string Value::toString() const
+{
+    if (null)
+    {
+        return "NULL";
+    }
+    if (isArray())
+    {
+        std::string out = "{";
+        for (std::size_t i = 0; i < elements.size(); ++i)
+        {
+            out += (i ? ", " : "") + elements[i].toString();
+        }
+        return out + "}";
+    }
+    switch (type)
+    {
+        case CMPI_boolean:
+            return u ? "TRUE" : "FALSE";
+        case CMPI_char16:
+        case CMPI_uint8:
+        case CMPI_uint16:
+        case CMPI_uint32:
+        case CMPI_uint64:
+            return std::to_string(u);
+        case CMPI_sint8:
+        case CMPI_sint16:
+        case CMPI_sint32:
+        case CMPI_sint64:
+            return std::to_string(s);
+        case CMPI_real32:
+        case CMPI_real64:
+            return realText(r);
+        case CMPI_string:
+        case CMPI_dateTime:
+            return quoted(text);
+        case CMPI_ref:
+            return ref ? quoted(ref->toString()) : "NULL";
+        default:
+            return "<" + typeName(type) + ">";
+    }
+}
+
+bool Value::operator==(const Value& other) const
+{
+    if (type != other.type || null != other.null)
+    {
+        return false;
+    }
+    if (null)
+    {
+        return true;
+    }
+    if (isArray())
+    {
+        return elements == other.elements;
+    }
+    switch (type)
+    {
+        case CMPI_sint8:
+        case CMPI_sint16:
+        case CMPI_sint32:
+        case CMPI_sint64:
+            return s == other.s;
+        case CMPI_real32:
+        case CMPI_real64:
+            return r == other.r;
+        case CMPI_string:
+        case CMPI_dateTime:
+            return text == other.text;
+        case CMPI_ref:
+            return ref && other.ref ? *ref == *other.ref : ref == other.ref;
+        default:
+            return u == other.u;
+    }
+}
+
+const Value* findNamed(const NamedValues& values, std::string_view name)
+{
+    for (const auto& [n, v] : values)
+    {
+        if (sameName(n, name))
+        {
+            return &v;
+        }
+    }
+    return nullptr;
+}
+
+void setNamed(NamedValues& values, std::string name, Value value)
+{
+    for (auto& [n, v] : values)
+    {
+        if (sameName(n, name))
+        {
+            v = std::move(value);
+            return;
+        }
+    }
+    values.emplace_back(std::move(name), std::move(value));
+}
+
+const Value* ObjectPath::key(std::string_view name) const
+{
+    return findNamed(keys, name);
+}
+
+void ObjectPath::setKey(std::string name, Value value)
+{
+    setNamed(keys, std::move(name), std::move(value));
+}
+
+bool ObjectPath::operator==(const ObjectPath& other) const
+{
+    return nameSpace == other.nameSpace && className == other.className &&
+           host == other.host && keys == other.keys;
+}
+
+const Value* Instance::property(std::string_view name) const
+{
+    return findNamed(properties, name);
+}
+
+void Instance::setProperty(std::string name, Value value)
+{
+    setNamed(properties, std::move(name), std::move(value));
+}
+
+std::vector<std::string> Instance::propertyNames() const
+{
+    std::vector<std::string> names;
+    names.reserve(properties.size());
+    for (const auto& [n, v] : properties)
+    {
+        names.push_back(n);
+    }
+    return names;
+}
+
+CMPIType storedType(CMPIType type)
+{
+    if (type == CMPI_chars)
+    {
+        return CMPI_string;
+    }
+    if (type == CMPI_charsA)
+    {
+        return CMPI_stringA;
+    }
+    return type;
+}
+
+std::string typeName(CMPIType type)
+{
+    struct Entry
+    {
+        CMPIType type;
+        const char* name;
+    };
+    static constexpr std::array<Entry, 23> names{{
+        {CMPI_null, "CMPI_null"},         {CMPI_boolean, "CMPI_boolean"},
+        {CMPI_char16, "CMPI_char16"},     {CMPI_real32, "CMPI_real32"},
+        {CMPI_real64, "CMPI_real64"},     {CMPI_uint8, "CMPI_uint8"},
+        {CMPI_uint16, "CMPI_uint16"},     {CMPI_uint32, "CMPI_uint32"},
+        {CMPI_uint64, "CMPI_uint64"},     {CMPI_sint8, "CMPI_sint8"},
+        {CMPI_sint16, "CMPI_sint16"},     {CMPI_sint32, "CMPI_sint32"},
+        {CMPI_sint64, "CMPI_sint64"},     {CMPI_instance, "CMPI_instance"},
+        {CMPI_ref, "CMPI_ref"},           {CMPI_args, "CMPI_args"},
+        {CMPI_class, "CMPI_class"},       {CMPI_filter, "CMPI_filter"},
+        {CMPI_enumeration, "CMPI_enumeration"},
+        {CMPI_string, "CMPI_string"},     {CMPI_chars, "CMPI_chars"},
+        {CMPI_dateTime, "CMPI_dateTime"}, {CMPI_ptr, "CMPI_ptr"},
+    }};
+    const bool array = (type & CMPI_ARRAY) != 0 && type != CMPI_ARRAY;
+    const CMPIType element =
+        array ? static_cast<CMPIType>(type & ~CMPI_ARRAY) : type;
+    for (const Entry& e : names)
+    {
+        if (e.type == element)
+        {
+            return std::string(e.name) + (array ? "A" : "");
+        }
+    }
+    return "unknown";
+}
+
+} // namespace host

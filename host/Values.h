@@ -1,0 +1,111 @@
+#pragma once
+
+#include <cmpidt.h>
+
+#include <cstdint>
+#include <memory>
+#include <optional>
+#include <string>
+#include <string_view>
+#include <utility>
+#include <vector>
+
+namespace host
+{
+
+class Schema;
+struct ObjectPath;
+
+// A plain C++ copy of a CMPI value, independent of any request.
+struct Value
+{
+    CMPIType type = CMPI_null;  // CMPI_chars is stored as CMPI_string
+    bool null = false;
+    std::uint64_t u = 0;        // unsigned integers, char16 and boolean (0/1)
+    std::int64_t s = 0;         // signed integers
+    double r = 0;               // reals
+    std::string text;           // CMPI_string, CMPI_dateTime (25-char text)
+    std::vector<Value> elements;     // arrays (type has the CMPI_ARRAY bit)
+    std::shared_ptr<ObjectPath> ref; // CMPI_ref
+
+    // MOF-like text: "\"text\"", "42", "TRUE", "{1, 2}", "NULL".
+    std::string toString() const;
+    bool isArray() const
+    {
+        return (type & CMPI_ARRAY) != 0;
+    }
+    bool operator==(const Value& other) const;
+
+    static Value nullOf(CMPIType type);
+    static Value boolean(bool value);
+    static Value unsignedInt(CMPIType type, std::uint64_t value);
+    static Value signedInt(CMPIType type, std::int64_t value);
+    static Value real(CMPIType type, double value);
+    static Value string(std::string value);
+    static Value dateTime(std::string cimText);
+    static Value reference(ObjectPath path);
+    static Value array(CMPIType elementType, std::vector<Value> elements);
+};
+
+using NamedValues = std::vector<std::pair<std::string, Value>>;
+
+// Case-insensitive lookup in a list of named values; nullptr if absent.
+const Value* findNamed(const NamedValues& values, std::string_view name);
+// Replaces a value of the same name in place, or appends a new one.
+void setNamed(NamedValues& values, std::string name, Value value);
+
+struct ObjectPath
+{
+    std::string nameSpace;
+    std::string className;
+    std::string host;
+    NamedValues keys; // in insertion order
+
+    const Value* key(std::string_view name) const;
+    void setKey(std::string name, Value value);
+    // WBEM text: [//host/]ns:Class.K1="v1",K2=7 with keys sorted by name.
+    std::string toString() const;
+    // Throws std::invalid_argument on malformed text. With a schema, keys
+    // of the class take the schema's types.
+    static ObjectPath parse(std::string_view text,
+                            const Schema* schema = nullptr);
+    bool operator==(const ObjectPath& other) const;
+};
+
+struct Instance
+{
+    ObjectPath path; // as the broker's getObjectPath returns it
+    NamedValues properties; // in the order first set
+    const Value* property(std::string_view name) const;
+    void setProperty(std::string name, Value value);
+    std::vector<std::string> propertyNames() const;
+};
+
+struct TraceRecord
+{
+    int level = 0;
+    std::string component;
+    std::string text;
+    std::optional<std::string> string;
+};
+
+struct LogRecord
+{
+    int severity = 0;
+    std::string id;
+    std::string text;
+    std::optional<std::string> string;
+};
+
+struct DeliveredIndication
+{
+    std::string nameSpace;
+    Instance instance;
+};
+
+// The name of a CMPI type code, e.g. "CMPI_uint16A"; "unknown" otherwise.
+std::string typeName(CMPIType type);
+// CMPI_chars -> CMPI_string, CMPI_charsA -> CMPI_stringA, others unchanged.
+CMPIType storedType(CMPIType type);
+
+} // namespace host

@@ -1,0 +1,41 @@
+#pragma once
+
+#include "NodeTree.h"
+
+#include <istream>
+#include <memory>
+#include <stdexcept>
+#include <string>
+
+namespace QX
+{
+
+/** A fixture text that cannot be read; what() names the line. */
+class FixtureError : public std::runtime_error
+{
+  public:
+    using std::runtime_error::runtime_error;
+};
+
+/**
+ * @brief Reads an instrumentation tree from the fixture text format.
+ *
+ * The format is documented in README.md ("Fixture files"). Throws
+ * FixtureError with the source name and line number on any error.
+ */
+std::shared_ptr<const NodeTree> parseFixture(std::istream& in,
+                                             const std::string& sourceName);
+std::shared_ptr<const NodeTree> loadFixtureFile(const std::string& path);
+
+/** The sample SEL that ships with the platform, compiled in. */
+const char* builtinSampleFixture();
+
+/**
+ * Writes a fixture with one controller, one log named "IPMI SEL Log" with
+ * MaxRecords @p maxRecords and @p entries generated entries (record ids
+ * 1..entries), for benchmarks and tests of large logs.
+ */
+void writeGeneratedFixture(std::ostream& out, unsigned entries,
+                           unsigned maxRecords);
+
+} // namespace QX

@@ -1,0 +1,112 @@
+#include "Platform.h"
+
+#include "CVLogger.h"
+#include "Fixture.h"
+#include "MemorySource.h"
+
+#include <iostream>
+#include <mutex>
+#include <sstream>
+#include <stdexcept>
+
+namespace QX::Platform
+{
+
+namespace
+{
+
+std::mutex sourceMutex;
+std::shared_ptr<InstrumentationSource> activeSource;
+
+std::vector<std::string> splitComponents(const std::string& list)
+{
+    std::vector<std::string> components;
+    std::istringstream items(list);
+    std::string item;
+    while (std::getline(items, item, ','))
+    {
+        const std::size_t first = item.find_first_not_of(" \t");
+        if (first == std::string::npos)
+        {
+            continue;
+        }
+        components.push_back(
+            item.substr(first, item.find_last_not_of(" \t") - first + 1));
+    }
+    return components;
+}
+
+std::shared_ptr<CVLog::LogSink> makeSink(const std::string& name)
+{
+    if (name == "syslog")
+    {
+        return CVLog::makeSyslogSink();
+    }
+    if (name == "stderr")
+    {
+        return CVLog::makeStderrSink();
+    }
+    if (name.starts_with("file:"))
+    {
+        return CVLog::makeFileSink(name.substr(5));
+    }
+    return nullptr; // "none"
+}
+
+void configureLogger(const Configuration& configuration)
+{
+    auto sink = makeSink(configuration.logSink);
+    CVLog::LoggerSettings settings;
+    settings.logLevel = configuration.logLevel;
+    settings.traceLevel = configuration.traceLevel;
+    settings.components = splitComponents(configuration.logComponents);
+    CVLog::CVLogger::setSink(std::move(sink));
+    CVLog::CVLogger::configure(settings);
+}
+
+std::shared_ptr<InstrumentationSource>
+makeSource(const Configuration& configuration)
+{
+    if (configuration.fixtureFile.empty())
+    {
+        std::istringstream sample(builtinSampleFixture());
+        return std::make_shared<MemorySource>(
+            parseFixture(sample, "built-in sample SEL"));
+    }
+    return std::make_shared<MemorySource>(
+        loadFixtureFile(configuration.fixtureFile));
+}
+
+} // namespace
+
+std::shared_ptr<InstrumentationSource> currentSource()
+{
+    const std::lock_guard lock(sourceMutex);
+    if (activeSource)
+    {
+        return activeSource;
+    }
+    try
+    {
+        const Configuration configuration = loadConfiguration();
+        configureLogger(configuration);
+        activeSource = makeSource(configuration);
+    }
+    catch (const std::exception& error)
+    {
+        const std::string reason =
+            std::string("instrumentation platform unavailable: ") +
+            error.what();
+        std::cerr << reason << std::endl;
+        throw std::runtime_error(reason);
+    }
+    return activeSource;
+}
+
+void overrideSource(std::shared_ptr<InstrumentationSource> source)
+{
+    const std::lock_guard lock(sourceMutex);
+    activeSource = std::move(source);
+}
+
+} // namespace QX::Platform

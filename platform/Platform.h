@@ -1,0 +1,53 @@
+#pragma once
+
+#include "InstrumentationSource.h"
+
+#include <memory>
+#include <string>
+
+namespace QX::Platform
+{
+
+/** Fixed location of the platform configuration file. */
+constexpr const char* defaultConfigurationPath = "/etc/qx/platform.conf";
+/** Environment variable that, when set, names another configuration file. */
+constexpr const char* configurationPathVariable = "QX_PLATFORM_CONFIG";
+
+/** The settings of the platform configuration file (see README.md). */
+struct Configuration
+{
+    /** "memory": the in-memory source, from fixtureFile or, when that is
+     *  empty, the built-in sample SEL. */
+    std::string source = "memory";
+    std::string fixtureFile;
+    /** Logger: "syslog", "stderr", "none" or "file:PATH". */
+    std::string logSink = "syslog";
+    /** Lowest level written on the log channel; 0 disables the channel. */
+    int logLevel = 6000;
+    /** Lowest level written on the trace channel; 0 disables it. */
+    int traceLevel = 0;
+    /** Components written, comma separated; "*" for all. */
+    std::string logComponents = "*";
+};
+
+/**
+ * Parses configuration text. Unknown keys and malformed lines throw
+ * std::runtime_error naming the line.
+ */
+Configuration parseConfiguration(const std::string& text,
+                                  const std::string& sourceName);
+/** Reads the file named by QX_PLATFORM_CONFIG, else the default path; a
+ *  missing file gives the defaults. */
+Configuration loadConfiguration();
+
+/**
+ * The process's instrumentation source, made from the configuration at
+ * first use (and the logger configured with it).
+ */
+std::shared_ptr<InstrumentationSource> currentSource();
+
+/** Puts @p source in place of the configured one (tools and tests); a null
+ *  pointer returns to the configuration at the next use. */
+void overrideSource(std::shared_ptr<InstrumentationSource> source);
+
+} // namespace QX::Platform

@@ -1,0 +1,75 @@
+#pragma once
+
+#include <string>
+
+namespace QX
+{
+
+namespace Locale
+{
+
+/** Languages the message resources carry. */
+enum LanguageId : unsigned
+{
+    English = 0,
+    German = 1,
+};
+
+/** Opaque handle of one resource library in one language. */
+struct ResourceLibrary
+{
+    unsigned library = 0;
+    LanguageId language = English;
+};
+
+/** Resource library of the SEL provider's messages. */
+constexpr unsigned SelProviderLibrary = 1;
+
+/** The language of the process: LC_ALL, LC_MESSAGES, then LANG; German
+ *  for a "de" prefix, English otherwise. */
+LanguageId getLanguageId();
+ResourceLibrary getResourceLibrary(unsigned library, LanguageId language);
+
+} // namespace Locale
+
+/**
+ * @brief The text of one message identifier in one resource library.
+ *
+ * An identifier the library does not hold gives an empty text. Texts may
+ * hold printf-style conversions, documented per identifier.
+ */
+class ResourceString
+{
+  public:
+    ResourceString(const Locale::ResourceLibrary& library,
+                   const std::wstring& identifier);
+
+    const std::wstring& str() const
+    {
+        return text_;
+    }
+    operator const std::wstring&() const
+    {
+        return text_;
+    }
+
+  private:
+    std::wstring text_;
+};
+
+/** UTF-8 form of a wide text (up to its first NUL for the pointer form). */
+std::string make_string(const std::wstring& text);
+std::string make_string(const wchar_t* text);
+
+namespace Product
+{
+
+/** Stable identity of this system as a UUID text
+ *  (xxxxxxxx-xxxx-xxxx-xxxx-xxxxxxxxxxxx, lower case): from the DMI
+ *  product UUID when readable, else from /etc/machine-id; all zeros when
+ *  neither can be read. */
+std::wstring getUid();
+
+} // namespace Product
+
+} // namespace QX

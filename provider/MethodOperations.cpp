@@ -1,0 +1,58 @@
+#include "CmpiValues.h"
+#include "SELObjectFactory.h"
+#include "SELProvider.h"
+#include "sdk/qxlib/include/Trace.h"
+
+#include <strings.h>
+
+namespace QX::SELComposite
+{
+
+namespace
+{
+
+constexpr const char* unitFile = "SELProvider.cpp";
+
+bool equalIgnoringCase(const char* left, const char* right)
+{
+    return left != nullptr && right != nullptr &&
+           ::strcasecmp(left, right) == 0;
+}
+
+} // namespace
+
+CMPIStatus SEL_InvokeMethod(CMPIMethodMI*, const CMPIContext*,
+                            const CMPIResult* result,
+                            const CMPIObjectPath* objectPath,
+                            const char* method, const CMPIArgs*, CMPIArgs*)
+{
+    constexpr const char* function = "SEL_InvokeMethod";
+    markProviderEntry(loggerSELProvider, function, unitFile, __LINE__);
+    CMPIStatus status{CMPI_RC_OK, nullptr};
+    const char* className = charsOf(
+        objectPath->ft->getClassName(objectPath, &status), &status);
+    if (equalIgnoringCase(className, LOG_CLASS_NAME) &&
+        equalIgnoringCase(method, "ClearLog"))
+    {
+        SELObjectFactory factory(className);
+        if (factory.executeClearLog() != 0)
+        {
+            status.rc = CMPI_RC_ERR_FAILED;
+            const CMPIBroker* const currentBroker = broker.load();
+            if (currentBroker != nullptr)
+            {
+                status.msg = currentBroker->eft->newString(
+                    currentBroker, "Execute Method Failed", nullptr);
+            }
+        }
+    }
+    // The method's return value mirrors the status code.
+    CMPIValue returnValue{};
+    returnValue.uint32 = static_cast<CMPIUint32>(status.rc);
+    result->ft->returnData(result, &returnValue, CMPI_uint32);
+    result->ft->returnDone(result);
+    markProviderExit(loggerSELProvider, function, unitFile, __LINE__);
+    return status;
+}
+
+} // namespace QX::SELComposite
