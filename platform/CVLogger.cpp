@@ -73,9 +73,9 @@ void CaptureSink::clear()
     records_.clear();
 }
 
-void CVLogger::logLevelMessage(const char* function, const char* file,
-                               int line, const std::string& component,
-                               int level, char* /*extra*/, int /*reserved1*/,
+void CVLogger::logLevelMessage(const char* function, const char* file, int line,
+                               const std::string& component, int level,
+                               char* /*extra*/, int /*reserved1*/,
                                int /*reserved2*/, const std::string& message)
 {
     emit(Channel::Log, function, file, line, component, level, message);
@@ -83,9 +83,8 @@ void CVLogger::logLevelMessage(const char* function, const char* file,
 
 void CVLogger::traceLevelMessage(const char* function, const char* file,
                                  int line, const std::string& component,
-                                 int level, char* /*extra*/,
-                                 int /*reserved1*/, int /*reserved2*/,
-                                 const std::string& message)
+                                 int level, char* /*extra*/, int /*reserved1*/,
+                                 int /*reserved2*/, const std::string& message)
 {
     emit(Channel::Trace, function, file, line, component, level, message);
 }

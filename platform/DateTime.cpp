@@ -29,13 +29,8 @@ DateTime::DateTime(unsigned year, unsigned month, unsigned day, unsigned hour,
                    unsigned minute, unsigned second, unsigned millisecond,
                    int offsetHours) :
     year_(year),
-    month_(month),
-    day_(day),
-    hour_(hour),
-    minute_(minute),
-    second_(second),
-    millisecond_(millisecond),
-    offsetHours_(offsetHours)
+    month_(month), day_(day), hour_(hour), minute_(minute), second_(second),
+    millisecond_(millisecond), offsetHours_(offsetHours)
 {
 }
 

@@ -174,7 +174,8 @@ class LineReader
         return {std::move(word), std::move(values)};
     }
 
-    unsigned parseUnsigned(const std::string& key, const std::string& text) const
+    unsigned parseUnsigned(const std::string& key,
+                           const std::string& text) const
     {
         if (text.empty() || text.size() > 10 ||
             text.find_first_not_of("0123456789") != std::string::npos)

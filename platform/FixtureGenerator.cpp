@@ -22,22 +22,43 @@ struct EventPattern
 };
 
 constexpr EventPattern patterns[] = {
-    {0x01, 0x30, 0x01, {0x57, 0x52, 0x50},
+    {0x01,
+     0x30,
+     0x01,
+     {0x57, 0x52, 0x50},
      "Temperature CPU1 Temp: Upper Non-critical going high asserted "
      "(reading 82 C, threshold 80 C)"},
-    {0x01, 0x30, 0x81, {0x57, 0x4e, 0x50},
+    {0x01,
+     0x30,
+     0x81,
+     {0x57, 0x4e, 0x50},
      "Temperature CPU1 Temp: Upper Non-critical going high deasserted "
      "(reading 78 C, threshold 80 C)"},
-    {0x02, 0x14, 0x01, {0x52, 0xb6, 0xb9},
+    {0x02,
+     0x14,
+     0x01,
+     {0x52, 0xb6, 0xb9},
      "Voltage 12V: Lower Critical going low asserted"},
-    {0x04, 0x43, 0x01, {0x52, 0x05, 0x06},
+    {0x04,
+     0x43,
+     0x01,
+     {0x52, 0x05, 0x06},
      "Fan FAN3: Lower Critical going low"},
-    {0x08, 0x52, 0x6f, {0x03, 0xff, 0xff},
+    {0x08,
+     0x52,
+     0x6f,
+     {0x03, 0xff, 0xff},
      "Power Supply PSU2: Power Supply AC lost asserted"},
     {0x09, 0x50, 0x6f, {0x00, 0xff, 0xff}, "Power Unit: Power off / down"},
-    {0x12, 0x83, 0x6f, {0x01, 0xff, 0xff},
+    {0x12,
+     0x83,
+     0x6f,
+     {0x01, 0xff, 0xff},
      "System Event: OEM System boot event"},
-    {0x23, 0x71, 0x6f, {0xc1, 0x04, 0xff},
+    {0x23,
+     0x71,
+     0x6f,
+     {0xc1, 0x04, 0xff},
      "Watchdog 2: Hard reset (timer use SMS/OS)"},
     {0x07, 0x11, 0x6f, {0x00, 0xff, 0xff}, "Processor CPU2: IERR"},
     {0x0c, 0x60, 0x6f, {0xa0, 0x00, 0x01}, "Memory DIMM_A1: Correctable ECC"},
@@ -112,8 +133,8 @@ void writeGeneratedFixture(std::ostream& out, unsigned entries,
     {
         const EventPattern& pattern = patterns[(recordId - 1) % patternCount];
         const std::time_t when =
-            firstRecordTime + static_cast<std::time_t>(recordId - 1) *
-                                  recordSpacing;
+            firstRecordTime +
+            static_cast<std::time_t>(recordId - 1) * recordSpacing;
         out << "entry RecordId=" << recordId << " Timestamp=\""
             << formatTimestamp(when) << "\" RecordData=\""
             << formatRecordData(recordId, when, pattern) << "\" description=\""

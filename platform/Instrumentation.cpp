@@ -11,7 +11,8 @@ Instrumentation::Instrumentation() : Instrumentation(Platform::currentSource())
 {
 }
 
-Instrumentation::Instrumentation(std::shared_ptr<InstrumentationSource> source) :
+Instrumentation::Instrumentation(
+    std::shared_ptr<InstrumentationSource> source) :
     source_(std::move(source))
 {
     if (!source_)
@@ -158,8 +159,7 @@ bool Instrumentation::getProperty(NodeLexicon::Properties property,
     return readProperty(property, value);
 }
 
-bool Instrumentation::getProperty(NodeLexicon::Properties property,
-                                  bool& value)
+bool Instrumentation::getProperty(NodeLexicon::Properties property, bool& value)
 {
     return readProperty(property, value);
 }

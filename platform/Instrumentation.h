@@ -22,9 +22,11 @@ namespace QX
  * Selection and stepping follow the kind last selected: selectNode(kind)
  * stands on the first node of that kind (within the filter, if one is set),
  * operator++ moves to the next one, and the cursor becomes invalid after the
- * last. setFilter(Parent, path) restricts selection and stepping to nodes
- * under that path; a current node outside the new filter is replaced by the
- * first node of its kind inside it.
+ * last. selectNode(path) stands on that node when it lies within the filter
+ * (invalid otherwise) and makes its kind the one stepped through.
+ * setFilter(Parent, path) restricts selection and stepping to nodes under
+ * that path; a current node outside the new filter is replaced by the first
+ * node of its kind inside it.
  */
 class Instrumentation
 {

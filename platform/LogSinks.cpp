@@ -1,13 +1,12 @@
 #include "CVLogger.h"
 
-#include <syslog.h>
-
 #include <cerrno>
 #include <chrono>
 #include <cstdio>
 #include <cstring>
 #include <ctime>
 #include <stdexcept>
+#include <syslog.h>
 
 namespace CVLog
 {
@@ -38,7 +37,8 @@ std::string isoTimeNow()
 /** One line of the stderr and file sinks, ending in a newline. */
 std::string formatLine(const LogRecord& record)
 {
-    return isoTimeNow() + (record.channel == Channel::Log ? " LOG " : " TRACE ") +
+    return isoTimeNow() +
+           (record.channel == Channel::Log ? " LOG " : " TRACE ") +
            std::to_string(record.level) + " [" + record.component + "] " +
            record.message + " (" + record.function + ", " + record.file + ":" +
            std::to_string(record.line) + ")\n";

@@ -57,8 +57,8 @@ bool MemorySource::writeProperty(const std::string& path,
             return false;
         }
         const auto controller = tree_->find(path);
-        if (!controller || tree_->node(*controller).kind !=
-                               NodeLexicon::ManagementController)
+        if (!controller ||
+            tree_->node(*controller).kind != NodeLexicon::ManagementController)
         {
             return false;
         }
@@ -93,18 +93,16 @@ void MemorySource::startMonitoring(NodeLexicon::NodeType kind,
 }
 
 void MemorySource::stopMonitoring(NodeLexicon::NodeType kind,
-                                  MonitorCallback callback,
-                                  const void* context)
+                                  MonitorCallback callback, const void* context)
 {
     const std::lock_guard lock(mutex_);
-    const auto found =
-        std::find_if(monitors_.begin(), monitors_.end(),
-                     [&](const Monitor& monitor)
-                     {
-                         return monitor.kind == kind &&
-                                monitor.callback == callback &&
-                                monitor.context == context;
-                     });
+    const auto found = std::find_if(monitors_.begin(), monitors_.end(),
+                                    [&](const Monitor& monitor)
+                                    {
+                                        return monitor.kind == kind &&
+                                               monitor.callback == callback &&
+                                               monitor.context == context;
+                                    });
     if (found != monitors_.end())
     {
         monitors_.erase(found);
@@ -162,7 +160,8 @@ std::string MemorySource::appendEntry(const std::string& logPath,
             throw std::invalid_argument("no event log at " + logPath);
         }
         NodeTreeBuilder builder(*tree_);
-        builder.addNode(NodeLexicon::EventLogEntry, path, logPath, description, 0)
+        builder
+            .addNode(NodeLexicon::EventLogEntry, path, logPath, description, 0)
             .setProperty(path, NodeLexicon::RecordId, recordId)
             .setProperty(path, NodeLexicon::Timestamp, timestamp)
             .setProperty(path, NodeLexicon::RecordData, recordData)
@@ -217,10 +216,9 @@ void MemorySource::refuseWrites(bool refuse)
 std::size_t MemorySource::monitorCount(NodeLexicon::NodeType kind) const
 {
     const std::lock_guard lock(mutex_);
-    return static_cast<std::size_t>(
-        std::count_if(monitors_.begin(), monitors_.end(),
-                      [kind](const Monitor& monitor)
-                      { return monitor.kind == kind; }));
+    return static_cast<std::size_t>(std::count_if(
+        monitors_.begin(), monitors_.end(),
+        [kind](const Monitor& monitor) { return monitor.kind == kind; }));
 }
 
 unsigned MemorySource::acceptedWrites() const
@@ -246,10 +244,9 @@ void MemorySource::deliver(
     std::vector<Monitor> targets;
     {
         const std::lock_guard lock(mutex_);
-        std::copy_if(monitors_.begin(), monitors_.end(),
-                     std::back_inserter(targets),
-                     [kind](const Monitor& monitor)
-                     { return monitor.kind == kind; });
+        std::copy_if(
+            monitors_.begin(), monitors_.end(), std::back_inserter(targets),
+            [kind](const Monitor& monitor) { return monitor.kind == kind; });
     }
     for (const auto& [path, code] : alerts)
     {

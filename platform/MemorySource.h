@@ -54,7 +54,9 @@ class MemorySource : public InstrumentationSource
     void replaceTree(std::shared_ptr<const NodeTree> tree);
     /**
      * Adds an entry under the log at @p logPath with the next path of that
-     * log (see entryPath), and raises AlertOnEventLogEntry for it.
+     * log (see entryPath), sets the log's IsEmpty to false, and raises
+     * AlertOnEventLogEntry for it. Throws std::invalid_argument when there
+     * is no log at @p logPath or the entry exists already.
      * @return the new entry's path
      */
     std::string appendEntry(const std::string& logPath, unsigned recordId,

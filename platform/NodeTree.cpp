@@ -144,8 +144,8 @@ NodeTreeBuilder::removeProperty(const std::string& path,
                                 NodeLexicon::Properties property)
 {
     auto& properties = at(path).properties;
-    std::erase_if(properties,
-                  [property](const auto& item) { return item.first == property; });
+    std::erase_if(properties, [property](const auto& item)
+                  { return item.first == property; });
     return *this;
 }
 

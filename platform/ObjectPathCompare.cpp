@@ -146,8 +146,8 @@ Integer integerOf(const CMPIData& data)
 bool pathsEqual(const CMPIObjectPath* left, const CMPIObjectPath* right,
                 bool compareHosts, int depth);
 
-bool valuesEqual(const CMPIData& left, const CMPIData& right,
-                 bool compareHosts, int depth)
+bool valuesEqual(const CMPIData& left, const CMPIData& right, bool compareHosts,
+                 int depth)
 {
     const auto unusable = CMPI_nullValue | CMPI_notFound | CMPI_badValue;
     if ((left.state & unusable) != 0 || (right.state & unusable) != 0)
@@ -281,8 +281,8 @@ bool pathsEqual(const CMPIObjectPath* left, const CMPIObjectPath* right,
     {
         return false;
     }
-    if (compareHosts && !namesEqual(left, right, left->ft->getHostname,
-                                    right->ft->getHostname))
+    if (compareHosts &&
+        !namesEqual(left, right, left->ft->getHostname, right->ft->getHostname))
     {
         return false;
     }

@@ -48,8 +48,7 @@ LanguageId getLanguageId()
         const char* value = std::getenv(variable);
         if (value != nullptr && *value != '\0')
         {
-            return std::string_view(value).starts_with("de") ? German
-                                                             : English;
+            return std::string_view(value).starts_with("de") ? German : English;
         }
     }
     return English;

@@ -1,8 +1,7 @@
 #include "Support.h"
 
-#include <unistd.h>
-
 #include <climits>
+#include <unistd.h>
 
 namespace QX
 {

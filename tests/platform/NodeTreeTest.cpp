@@ -2,9 +2,9 @@
 
 #include "platform/TestTrees.h"
 
-#include <gtest/gtest.h>
-
 #include <stdexcept>
+
+#include <gtest/gtest.h>
 
 using namespace QX;
 using namespace QX::NodeLexicon;
@@ -27,7 +27,7 @@ std::vector<std::string> pathsOf(const NodeTree& tree,
 
 TEST(NodeTree, KeepsInsertionOrderAndFindsByPath)
 {
-    const auto tree = testing::twoControllerTree();
+    const auto tree = test::twoControllerTree();
     ASSERT_EQ(tree->size(), 12u);
     EXPECT_EQ(tree->node(0).path, "/bmc0");
     EXPECT_EQ(tree->node(1).path, "/bmc0/sel");
@@ -42,9 +42,10 @@ TEST(NodeTree, KeepsInsertionOrderAndFindsByPath)
 
 TEST(NodeTree, IndexesKindsByEveryAncestor)
 {
-    const auto tree = testing::twoControllerTree();
-    EXPECT_EQ(pathsOf(*tree, tree->nodesOfKind(EventLog)),
-              (std::vector<std::string>{"/bmc0/sel", "/bmc0/aux", "/bmc1/sel"}));
+    const auto tree = test::twoControllerTree();
+    EXPECT_EQ(
+        pathsOf(*tree, tree->nodesOfKind(EventLog)),
+        (std::vector<std::string>{"/bmc0/sel", "/bmc0/aux", "/bmc1/sel"}));
     const auto bmc0 = *tree->find("/bmc0");
     const auto bmc1 = *tree->find("/bmc1");
     EXPECT_EQ(pathsOf(*tree, tree->nodesOfKind(EventLog, bmc1)),
@@ -61,7 +62,7 @@ TEST(NodeTree, IndexesKindsByEveryAncestor)
 
 TEST(NodeTree, UnknownKindOrAncestorGivesTheSameEmptyList)
 {
-    const auto tree = testing::twoControllerTree();
+    const auto tree = test::twoControllerTree();
     const auto& none1 = tree->nodesOfKind(Watchdog, *tree->find("/bmc1"));
     const auto& none2 = tree->nodesOfKind(static_cast<NodeType>(999));
     EXPECT_TRUE(none1.empty());
@@ -72,7 +73,7 @@ TEST(NodeTree, UnknownKindOrAncestorGivesTheSameEmptyList)
 
 TEST(NodeTree, IsUnderAndPositions)
 {
-    const auto tree = testing::twoControllerTree();
+    const auto tree = test::twoControllerTree();
     const auto bmc0 = *tree->find("/bmc0");
     const auto sel = *tree->find("/bmc0/sel");
     const auto entry2 = *tree->find("/bmc0/sel/entry-00002");
@@ -132,7 +133,7 @@ TEST(NodeTreeBuilder, RejectsDuplicatesUnknownParentsAndEmptyPaths)
 
 TEST(NodeTreeBuilder, RemoveNodesDropsDescendantsAndReindexes)
 {
-    const auto original = testing::twoControllerTree();
+    const auto original = test::twoControllerTree();
     NodeTreeBuilder builder(*original);
     builder.removeNodes(EventLogEntry, "/bmc0");
     builder.addNode(EventLogEntry, "/bmc0/sel/entry-00009", "/bmc0/sel", "", 0);
@@ -161,7 +162,7 @@ TEST(NodeTreeBuilder, RemoveNodesDropsDescendantsAndReindexes)
 
 TEST(NodeTreeBuilder, RemovingAKindRemovesItsSubtree)
 {
-    const auto original = testing::twoControllerTree();
+    const auto original = test::twoControllerTree();
     NodeTreeBuilder builder(*original);
     builder.removeNodes(EventLog, "/bmc0");
     const auto tree = builder.build();

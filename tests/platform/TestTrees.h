@@ -8,7 +8,7 @@
 #include <memory>
 #include <string>
 
-namespace QX::testing
+namespace QX::test
 {
 
 /**
@@ -48,4 +48,4 @@ inline std::shared_ptr<const NodeTree> twoControllerTree()
     return builder.build();
 }
 
-} // namespace QX::testing
+} // namespace QX::test

@@ -1,0 +1,108 @@
+#include "EntryFixture.h"
+
+#include <gtest/gtest.h>
+
+namespace
+{
+
+using entry::classPath;
+using entry::ProviderTest;
+using entry::selTree;
+
+class ClearLog : public ProviderTest
+{
+  protected:
+    host::ObjectPath logPath(const std::string& className = "ZAN_MgmtHwLog")
+    {
+        host::ObjectPath path = classPath(className);
+        path.keys.push_back({"Name", host::Value::string("IPMI SEL Log")});
+        path.keys.push_back(
+            {"CreationClassName", host::Value::string("ZAN_MgmtHwLog")});
+        return path;
+    }
+
+    std::size_t entryCount()
+    {
+        return host()
+            .enumerateInstanceNames(classPath("ZAN_MgmtHwLogEntry"))
+            .paths.size();
+    }
+};
+
+void expectReturnValue(const host::Outcome& outcome, std::uint64_t value)
+{
+    ASSERT_EQ(outcome.data.size(), 1u);
+    EXPECT_EQ(outcome.data[0].type, CMPI_uint32);
+    EXPECT_EQ(outcome.data[0].u, value);
+    EXPECT_TRUE(outcome.done);
+}
+
+TEST_F(ClearLog, ClearsTheLog)
+{
+    install(selTree(6));
+    ASSERT_EQ(entryCount(), 6u);
+    const auto outcome = host().invokeMethod(logPath(), "ClearLog");
+    EXPECT_EQ(outcome.rc, CMPI_RC_OK);
+    EXPECT_FALSE(outcome.message.has_value());
+    expectReturnValue(outcome, 0);
+    EXPECT_EQ(source->acceptedWrites(), 1u);
+    EXPECT_EQ(entryCount(), 0u);
+}
+
+TEST_F(ClearLog, NamesAreMatchedIgnoringCase)
+{
+    install(selTree(2));
+    const auto outcome =
+        host().invokeMethod(logPath("zan_mgmthwlog"), "CLEARLOG");
+    EXPECT_EQ(outcome.rc, CMPI_RC_OK);
+    expectReturnValue(outcome, 0);
+    EXPECT_EQ(source->acceptedWrites(), 1u);
+}
+
+TEST_F(ClearLog, OtherMethodsAreAcceptedSilently)
+{
+    install(selTree(2));
+    const auto outcome = host().invokeMethod(logPath(), "ResetLog");
+    EXPECT_EQ(outcome.rc, CMPI_RC_OK);
+    expectReturnValue(outcome, 0);
+    EXPECT_EQ(source->acceptedWrites(), 0u);
+    EXPECT_EQ(entryCount(), 2u);
+}
+
+TEST_F(ClearLog, OnOtherClassesNothingIsCleared)
+{
+    install(selTree(2));
+    const auto outcome =
+        host().invokeMethod(logPath("ZAN_MgmtHwLogEntry"), "ClearLog");
+    EXPECT_EQ(outcome.rc, CMPI_RC_OK);
+    expectReturnValue(outcome, 0);
+    EXPECT_EQ(source->acceptedWrites(), 0u);
+}
+
+TEST_F(ClearLog, RefusedClearFails)
+{
+    install(selTree(2));
+    source->refuseWrites(true);
+    const auto outcome = host().invokeMethod(logPath(), "ClearLog");
+    EXPECT_EQ(outcome.rc, CMPI_RC_ERR_FAILED);
+    ASSERT_TRUE(outcome.message.has_value());
+    EXPECT_EQ(*outcome.message, "Execute Method Failed");
+    expectReturnValue(outcome, 1);
+    EXPECT_EQ(entryCount(), 2u);
+}
+
+TEST_F(ClearLog, InstrumentationExceptionBecomesAFailedStatus)
+{
+    install(selTree(2));
+    source->armFault(
+        {QX::CursorOperation::SetProperty, 0, false, "BMC unreachable"});
+    ::testing::internal::CaptureStderr();
+    const auto outcome = host().invokeMethod(logPath(), "ClearLog");
+    EXPECT_EQ(::testing::internal::GetCapturedStderr(), "BMC unreachable\n");
+    EXPECT_EQ(outcome.rc, CMPI_RC_ERR_FAILED);
+    ASSERT_TRUE(outcome.message.has_value());
+    EXPECT_NE(outcome.message->find("BMC unreachable"), std::string::npos);
+    EXPECT_EQ(entryCount(), 2u);
+}
+
+} // namespace

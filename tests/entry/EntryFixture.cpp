@@ -1,0 +1,63 @@
+#include "EntryFixture.h"
+
+#include "CVLogger.h"
+
+namespace entry
+{
+
+using namespace QX::NodeLexicon;
+
+QX::NodeTreeBuilder selTree(unsigned entries)
+{
+    QX::NodeTreeBuilder tree;
+    tree.addNode(ManagementController, "/bmc0", "", "BMC", 1);
+    tree.addNode(EventLog, "/bmc0/sel", "/bmc0", "System Event Log", 1);
+    tree.setProperty("/bmc0/sel", Name, std::string("IPMI SEL Log"));
+    tree.setProperty("/bmc0/sel", MaxRecords, 512u);
+    tree.setProperty("/bmc0/sel", OverwritePolicy, 1u);
+    tree.setProperty("/bmc0/sel", DataFormat, std::string("hex bytes"));
+    for (unsigned id = 1; id <= entries; ++id)
+    {
+        addEntry(tree, id);
+    }
+    return tree;
+}
+
+void addEntry(QX::NodeTreeBuilder& tree, unsigned recordId,
+              const std::string& timestamp, const std::string& description)
+{
+    const std::string path = QX::MemorySource::entryPath("/bmc0/sel", recordId);
+    tree.addNode(EventLogEntry, path, "/bmc0/sel", description, 1);
+    tree.setProperty(path, RecordId, recordId);
+    tree.setProperty(path, Timestamp, timestamp);
+    tree.setProperty(path, RecordData, std::string("0a 0b"));
+}
+
+host::ObjectPath classPath(const std::string& className)
+{
+    host::ObjectPath path;
+    path.nameSpace = nameSpace;
+    path.className = className;
+    return path;
+}
+
+void ProviderTest::SetUp()
+{
+    // Keep the provider's diagnostics out of the system log during tests.
+    CVLog::CVLogger::setSink(nullptr);
+    host_ = std::make_unique<host::Host>(SELPROV_LIBRARY);
+}
+
+void ProviderTest::TearDown()
+{
+    host_.reset();
+    QX::Platform::overrideSource(nullptr);
+}
+
+void ProviderTest::install(const QX::NodeTreeBuilder& tree)
+{
+    source = std::make_shared<QX::MemorySource>(tree.build());
+    QX::Platform::overrideSource(source);
+}
+
+} // namespace entry

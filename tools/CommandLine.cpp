@@ -1,0 +1,229 @@
+#include "CommandLine.h"
+
+#include "Names.h"
+
+#include <cstddef>
+
+namespace selprov
+{
+namespace
+{
+
+std::vector<std::string> splitProperties(const std::string& list)
+{
+    std::vector<std::string> names;
+    if (list.empty())
+    {
+        return names;
+    }
+    std::size_t start = 0;
+    for (;;)
+    {
+        const std::size_t comma = list.find(',', start);
+        std::string name = list.substr(start, comma - start);
+        if (!host::isIdentifier(name))
+        {
+            throw UsageError("bad property name \"" + name +
+                             "\" in --properties");
+        }
+        names.push_back(std::move(name));
+        if (comma == std::string::npos)
+        {
+            return names;
+        }
+        start = comma + 1;
+    }
+}
+
+class Reader
+{
+public:
+    explicit Reader(const std::vector<std::string>& args) : args_(args)
+    {
+    }
+    bool done() const
+    {
+        return pos_ >= args_.size();
+    }
+    const std::string& peek() const
+    {
+        return args_[pos_];
+    }
+    std::string next(const char* what)
+    {
+        if (done())
+        {
+            throw UsageError(std::string("missing ") + what);
+        }
+        return args_[pos_++];
+    }
+    // The value of --name VALUE or --name=VALUE, if this argument is it.
+    std::optional<std::string> option(const std::string& name)
+    {
+        const std::string& arg = peek();
+        if (arg == name)
+        {
+            ++pos_;
+            if (done())
+            {
+                throw UsageError(name + " needs a value");
+            }
+            return args_[pos_++];
+        }
+        if (arg.rfind(name + "=", 0) == 0)
+        {
+            ++pos_;
+            return arg.substr(name.size() + 1);
+        }
+        return std::nullopt;
+    }
+
+private:
+    const std::vector<std::string>& args_;
+    std::size_t pos_ = 0;
+};
+
+void setOnce(std::optional<std::string>& slot, std::string value,
+             const char* name)
+{
+    if (slot)
+    {
+        throw UsageError(std::string(name) + " given twice");
+    }
+    slot = std::move(value);
+}
+
+} // namespace
+
+const char* usageText()
+{
+    return "usage: selprov [--library PATH] [--config FILE] [--namespace NS] "
+           "[--json] COMMAND ...\n"
+           "commands:\n"
+           "  enumerate-names CLASS\n"
+           "  enumerate CLASS [--properties P1,P2]\n"
+           "  get OBJECTPATH [--properties P1,P2]\n"
+           "  clear-log\n"
+           "  invoke OBJECTPATH METHOD\n"
+           "  help\n"
+           "OBJECTPATH is WBEM text, e.g. "
+           "'root/zanqx:ZAN_MgmtHwLog.CreationClassName=\"ZAN_MgmtHwLog\","
+           "Name=\"IPMI SEL\"'\n"
+           "(the namespace may be left out). --properties \"\" asks for no "
+           "properties.\n"
+           "--library defaults to ../lib/libSELProvider.so beside the "
+           "executable; --config sets QX_PLATFORM_CONFIG.\n";
+}
+
+Options parseCommandLine(const std::vector<std::string>& args)
+{
+    Options o;
+    Reader in(args);
+    std::optional<std::string> nameSpace;
+    while (!in.done() && in.peek().rfind("-", 0) == 0)
+    {
+        if (auto v = in.option("--library"))
+        {
+            setOnce(o.library, *v, "--library");
+        }
+        else if (auto c = in.option("--config"))
+        {
+            setOnce(o.config, *c, "--config");
+        }
+        else if (auto n = in.option("--namespace"))
+        {
+            setOnce(nameSpace, *n, "--namespace");
+        }
+        else if (in.peek() == "--json")
+        {
+            in.next("--json");
+            o.json = true;
+        }
+        else if (in.peek() == "--help" || in.peek() == "-h")
+        {
+            in.next("--help");
+            o.command = Command::Help;
+            return o;
+        }
+        else
+        {
+            throw UsageError("unknown option " + in.peek());
+        }
+    }
+    if (o.library && o.library->empty())
+    {
+        throw UsageError("--library needs a path");
+    }
+    if (o.config && o.config->empty())
+    {
+        throw UsageError("--config needs a file");
+    }
+    if (nameSpace)
+    {
+        if (nameSpace->empty())
+        {
+            throw UsageError("--namespace needs a namespace");
+        }
+        o.nameSpace = *nameSpace;
+    }
+    const std::string command = in.next("command");
+    bool takesProperties = false;
+    if (command == "enumerate-names" || command == "enumerate")
+    {
+        o.command = command == "enumerate" ? Command::Enumerate
+                                           : Command::EnumerateNames;
+        o.target = in.next("class name");
+        if (!host::isIdentifier(o.target))
+        {
+            throw UsageError("bad class name \"" + o.target + "\"");
+        }
+        takesProperties = o.command == Command::Enumerate;
+    }
+    else if (command == "get")
+    {
+        o.command = Command::Get;
+        o.target = in.next("object path");
+        takesProperties = true;
+    }
+    else if (command == "clear-log")
+    {
+        o.command = Command::ClearLog;
+    }
+    else if (command == "invoke")
+    {
+        o.command = Command::Invoke;
+        o.target = in.next("object path");
+        o.method = in.next("method name");
+        if (!host::isIdentifier(o.method))
+        {
+            throw UsageError("bad method name \"" + o.method + "\"");
+        }
+    }
+    else if (command == "help")
+    {
+        o.command = Command::Help;
+    }
+    else
+    {
+        throw UsageError("unknown command \"" + command + "\"");
+    }
+    while (!in.done())
+    {
+        std::optional<std::string> list;
+        if (takesProperties && (list = in.option("--properties")))
+        {
+            if (o.properties)
+            {
+                throw UsageError("--properties given twice");
+            }
+            o.properties = splitProperties(*list);
+        }
+        else
+        {
+            throw UsageError("unexpected argument \"" + in.peek() + "\"");
+        }
+    }
+    return o;
+}
+
+} // namespace selprov

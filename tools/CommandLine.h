@@ -1,0 +1,44 @@
+#pragma once
+
+#include <optional>
+#include <stdexcept>
+#include <string>
+#include <vector>
+
+namespace selprov
+{
+
+// A command line that cannot be run; selprov exits 2 with the usage text.
+class UsageError : public std::runtime_error
+{
+public:
+    using std::runtime_error::runtime_error;
+};
+
+enum class Command
+{
+    EnumerateNames,
+    Enumerate,
+    Get,
+    ClearLog,
+    Invoke,
+    Help,
+};
+
+struct Options
+{
+    std::optional<std::string> library;
+    std::optional<std::string> config;
+    std::string nameSpace = "root/zanqx";
+    bool json = false;
+    Command command = Command::Help;
+    std::string target;  // class name or object path
+    std::string method;  // invoke
+    std::optional<std::vector<std::string>> properties;
+};
+
+// Throws UsageError on anything malformed.
+Options parseCommandLine(const std::vector<std::string>& args);
+const char* usageText();
+
+} // namespace selprov

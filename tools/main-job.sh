@@ -1,0 +1,28 @@
+#!/usr/bin/env bash
+# Builds the provider and runs it as an object manager would, through its
+# exported factories, on the built-in sample SEL: enumerate the log and its
+# entries, get one entry by its path, clear the log and look again.
+set -euo pipefail
+cd "$(dirname "$0")/.."
+
+tools/setup-deps.sh
+cmake --preset default >/dev/null
+cmake --build --preset default --target SELProvider selprov
+
+selprov=build/bin/selprov
+run() {
+    echo
+    echo "\$ selprov $*"
+    "$selprov" "$@"
+}
+
+run enumerate-names ZAN_MgmtHwLog
+run enumerate ZAN_MgmtHwLog
+run enumerate ZAN_MgmtHwLogEntry --properties RecordID,MessageTimestamp,Description,RecordData
+entry=$("$selprov" enumerate-names ZAN_MgmtHwLogEntry | sed -n 5p)
+run get "$entry"
+# One process, so the cleared log is what the second request sees.
+echo
+echo "\$ selprov batch  (clear-log, then enumerate-names ZAN_MgmtHwLogEntry)"
+printf 'clear-log\nenumerate-names ZAN_MgmtHwLogEntry\nenumerate ZAN_MgmtHwLog --properties CurrentNumberOfRecords\n' |
+    "$selprov" batch

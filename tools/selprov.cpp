@@ -1,0 +1,231 @@
+// selprov: load the SEL provider into the in-process host and run one CIM
+// operation on it, printing the result as MOF-like text or JSON.
+#include "CommandLine.h"
+#include "Host.h"
+#include "Printing.h"
+#include "StatusText.h"
+
+#include <unistd.h>
+
+#include <cerrno>
+#include <climits>
+#include <cstdlib>
+#include <cstring>
+#include <iostream>
+#include <string>
+#include <vector>
+
+namespace
+{
+
+constexpr int exitFailed = 1;
+constexpr int exitUsage = 2;
+constexpr int exitLoad = 3;
+
+std::string defaultLibrary()
+{
+    std::vector<char> buf(PATH_MAX + 1);
+    const ssize_t n = readlink("/proc/self/exe", buf.data(), buf.size() - 1);
+    if (n <= 0)
+    {
+        return "libSELProvider.so";
+    }
+    std::string exe(buf.data(), static_cast<std::size_t>(n));
+    const auto slash = exe.rfind('/');
+    const std::string dir = slash == std::string::npos ? "." : exe.substr(0, slash);
+    return dir + "/../lib/libSELProvider.so";
+}
+
+host::ObjectPath targetPath(const selprov::Options& o)
+{
+    const host::Schema schema = host::selSchema();
+    host::ObjectPath path;
+    try
+    {
+        path = host::ObjectPath::parse(o.target, &schema);
+    }
+    catch (const std::invalid_argument& e)
+    {
+        throw selprov::UsageError(e.what());
+    }
+    if (path.nameSpace.empty())
+    {
+        path.nameSpace = o.nameSpace;
+    }
+    return path;
+}
+
+host::ObjectPath classPath(const selprov::Options& o,
+                           const std::string& className)
+{
+    host::ObjectPath path;
+    path.nameSpace = o.nameSpace;
+    path.className = className;
+    return path;
+}
+
+void printPaths(const selprov::Options& o, const host::Outcome& out)
+{
+    if (o.json)
+    {
+        std::cout << host::jsonPaths(out.paths);
+        return;
+    }
+    for (const host::ObjectPath& p : out.paths)
+    {
+        std::cout << p.toString() << "\n";
+    }
+}
+
+void printInstances(const selprov::Options& o, const host::Outcome& out)
+{
+    if (o.json)
+    {
+        std::cout << host::jsonInstances(out.instances);
+        return;
+    }
+    for (std::size_t i = 0; i < out.instances.size(); ++i)
+    {
+        std::cout << (i ? "\n" : "") << host::formatMof(out.instances[i]);
+    }
+}
+
+void printReturnValue(const selprov::Options& o, const host::Outcome& out)
+{
+    if (out.data.empty())
+    {
+        return;
+    }
+    const host::Value& rv = out.data.front();
+    if (o.json)
+    {
+        std::cout << "{\"ReturnValue\": " << host::jsonValue(rv) << "}\n";
+    }
+    else
+    {
+        std::cout << "ReturnValue = " << rv.toString() << "\n";
+    }
+}
+
+// Runs the command; returns the operation's outcome (already printed when
+// it succeeded).
+host::Outcome run(const selprov::Options& o, host::Host& h)
+{
+    using selprov::Command;
+    host::Outcome out;
+    switch (o.command)
+    {
+        case Command::EnumerateNames:
+            out = h.enumerateInstanceNames(classPath(o, o.target));
+            if (out.rc == CMPI_RC_OK)
+            {
+                printPaths(o, out);
+            }
+            break;
+        case Command::Enumerate:
+            out = h.enumerateInstances(
+                classPath(o, o.target),
+                o.properties ? &*o.properties : nullptr);
+            if (out.rc == CMPI_RC_OK)
+            {
+                printInstances(o, out);
+            }
+            break;
+        case Command::Get:
+            out = h.getInstance(targetPath(o),
+                                o.properties ? &*o.properties : nullptr);
+            if (out.rc == CMPI_RC_OK)
+            {
+                printInstances(o, out);
+            }
+            break;
+        case Command::ClearLog:
+        {
+            const host::ObjectPath logClass = classPath(o, "ZAN_MgmtHwLog");
+            const host::Outcome names = h.enumerateInstanceNames(logClass);
+            if (names.rc != CMPI_RC_OK)
+            {
+                return names;
+            }
+            out = h.invokeMethod(names.paths.empty() ? logClass
+                                                     : names.paths.front(),
+                                 "ClearLog");
+            if (out.rc == CMPI_RC_OK)
+            {
+                printReturnValue(o, out);
+            }
+            break;
+        }
+        case Command::Invoke:
+            out = h.invokeMethod(targetPath(o), o.method);
+            if (out.rc == CMPI_RC_OK)
+            {
+                printReturnValue(o, out);
+            }
+            break;
+        case Command::Help:
+            break;
+    }
+    return out;
+}
+
+} // namespace
+
+int main(int argc, char** argv)
+{
+    selprov::Options options;
+    try
+    {
+        options = selprov::parseCommandLine(
+            std::vector<std::string>(argv + 1, argv + argc));
+        if (options.command == selprov::Command::Help)
+        {
+            std::cout << selprov::usageText();
+            return 0;
+        }
+        if (options.command == selprov::Command::Get ||
+            options.command == selprov::Command::Invoke)
+        {
+            targetPath(options); // reject a bad path before loading
+        }
+        if (options.config)
+        {
+            if (access(options.config->c_str(), R_OK) != 0)
+            {
+                throw selprov::UsageError("cannot read config file " +
+                                          *options.config + ": " +
+                                          std::strerror(errno));
+            }
+            setenv("QX_PLATFORM_CONFIG", options.config->c_str(), 1);
+        }
+    }
+    catch (const selprov::UsageError& e)
+    {
+        std::cerr << "selprov: " << e.what() << "\n" << selprov::usageText();
+        return exitUsage;
+    }
+
+    try
+    {
+        host::Host h(options.library.value_or(defaultLibrary()));
+        const host::Outcome out = run(options, h);
+        if (out.rc != CMPI_RC_OK)
+        {
+            std::cerr << "selprov: "
+                      << host::describeStatus(out.rc, out.message) << "\n";
+            return exitFailed;
+        }
+        std::cout.flush();
+        return std::cout ? 0 : exitFailed;
+    }
+    catch (const host::LoadError& e)
+    {
+        std::cerr << "selprov: " << e.what() << "\n";
+        return exitLoad;
+    }
+    catch (const std::exception& e)
+    {
+        std::cerr << "selprov: " << e.what() << "\n";
+        return exitFailed;
+    }
+}
