@@ -28,9 +28,9 @@ bool sameName(std::string_view a, std::string_view b)
 
 bool nameLess(std::string_view a, std::string_view b)
 {
-    return std::lexicographical_compare(
-        a.begin(), a.end(), b.begin(), b.end(),
-        [](char x, char y) { return lower(x) < lower(y); });
+    return std::lexicographical_compare(a.begin(), a.end(), b.begin(), b.end(),
+                                        [](char x, char y)
+                                        { return lower(x) < lower(y); });
 }
 
 bool isIdentifier(std::string_view text)
@@ -39,7 +39,8 @@ bool isIdentifier(std::string_view text)
     {
         return false;
     }
-    return std::all_of(text.begin(), text.end(), [](char c)
+    return std::all_of(text.begin(), text.end(),
+                       [](char c)
                        { return isAlpha(c) || (c >= '0' && c <= '9'); });
 }
 

@@ -19,13 +19,13 @@ struct ObjectPath;
 // A plain C++ copy of a CMPI value, independent of any request.
 struct Value
 {
-    CMPIType type = CMPI_null;  // CMPI_chars is stored as CMPI_string
+    CMPIType type = CMPI_null; // CMPI_chars is stored as CMPI_string
     bool null = false;
-    std::uint64_t u = 0;        // unsigned integers, char16 and boolean (0/1)
-    std::int64_t s = 0;         // signed integers
-    double r = 0;               // reals
-    std::string text;           // CMPI_string, CMPI_dateTime (25-char text)
-    std::vector<Value> elements;     // arrays (type has the CMPI_ARRAY bit)
+    std::uint64_t u = 0;         // unsigned integers, char16 and boolean (0/1)
+    std::int64_t s = 0;          // signed integers
+    double r = 0;                // reals
+    std::string text;            // CMPI_string, CMPI_dateTime (25-char text)
+    std::vector<Value> elements; // arrays (type has the CMPI_ARRAY bit)
     std::shared_ptr<ObjectPath> ref; // CMPI_ref
 
     // MOF-like text: "\"text\"", "42", "TRUE", "{1, 2}", "NULL".
@@ -74,7 +74,7 @@ struct ObjectPath
 
 struct Instance
 {
-    ObjectPath path; // as the broker's getObjectPath returns it
+    ObjectPath path;        // as the broker's getObjectPath returns it
     NamedValues properties; // in the order first set
     const Value* property(std::string_view name) const;
     void setProperty(std::string name, Value value);

@@ -37,10 +37,8 @@ std::vector<std::string> splitProperties(const std::string& list)
 
 class Reader
 {
-public:
-    explicit Reader(const std::vector<std::string>& args) : args_(args)
-    {
-    }
+  public:
+    explicit Reader(const std::vector<std::string>& args) : args_(args) {}
     bool done() const
     {
         return pos_ >= args_.size();
@@ -78,7 +76,7 @@ public:
         return std::nullopt;
     }
 
-private:
+  private:
     const std::vector<std::string>& args_;
     std::size_t pos_ = 0;
 };

@@ -11,7 +11,7 @@ namespace selprov
 // A command line that cannot be run; selprov exits 2 with the usage text.
 class UsageError : public std::runtime_error
 {
-public:
+  public:
     using std::runtime_error::runtime_error;
 };
 
@@ -32,8 +32,8 @@ struct Options
     std::string nameSpace = "root/zanqx";
     bool json = false;
     Command command = Command::Help;
-    std::string target;  // class name or object path
-    std::string method;  // invoke
+    std::string target; // class name or object path
+    std::string method; // invoke
     std::optional<std::vector<std::string>> properties;
 };
 

@@ -5,14 +5,13 @@
 #include "Printing.h"
 #include "StatusText.h"
 
-#include <unistd.h>
-
 #include <cerrno>
 #include <climits>
 #include <cstdlib>
 #include <cstring>
 #include <iostream>
 #include <string>
+#include <unistd.h>
 #include <vector>
 
 namespace
@@ -32,7 +31,8 @@ std::string defaultLibrary()
     }
     std::string exe(buf.data(), static_cast<std::size_t>(n));
     const auto slash = exe.rfind('/');
-    const std::string dir = slash == std::string::npos ? "." : exe.substr(0, slash);
+    const std::string dir =
+        slash == std::string::npos ? "." : exe.substr(0, slash);
     return dir + "/../lib/libSELProvider.so";
 }
 
@@ -123,9 +123,8 @@ host::Outcome run(const selprov::Options& o, host::Host& h)
             }
             break;
         case Command::Enumerate:
-            out = h.enumerateInstances(
-                classPath(o, o.target),
-                o.properties ? &*o.properties : nullptr);
+            out = h.enumerateInstances(classPath(o, o.target),
+                                       o.properties ? &*o.properties : nullptr);
             if (out.rc == CMPI_RC_OK)
             {
                 printInstances(o, out);

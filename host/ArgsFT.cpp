@@ -1,0 +1,112 @@
+#include "BrokerState.h"
+#include "Objects.h"
+#include "ValueConversion.h"
+
+namespace host::detail
+{
+namespace
+{
+
+CMPIStatus argsRelease(CMPIArgs* as)
+{
+    ArgsObject* a = ArgsObject::of(as);
+    return a ? a->broker->release(a) : errorStatus(CMPI_RC_ERR_INVALID_HANDLE);
+}
+
+CMPIArgs* argsClone(const CMPIArgs* as, CMPIStatus* rc)
+{
+    const ArgsObject* a = ArgsObject::of(as);
+    if (a == nullptr)
+    {
+        setStatus(rc, CMPI_RC_ERR_INVALID_HANDLE);
+        return nullptr;
+    }
+    auto* copy = a->broker->makeOwned<ArgsObject>(Ownership::Clone);
+    copy->args = a->args;
+    setStatus(rc, CMPI_RC_OK);
+    return &copy->cmpi;
+}
+
+CMPIStatus argsAddArg(const CMPIArgs* as, const char* name,
+                      const CMPIValue* value, const CMPIType type)
+{
+    ArgsObject* a = ArgsObject::of(as);
+    if (a == nullptr)
+    {
+        return errorStatus(CMPI_RC_ERR_INVALID_HANDLE);
+    }
+    if (name == nullptr)
+    {
+        return errorStatus(CMPI_RC_ERR_INVALID_PARAMETER);
+    }
+    Value v;
+    const CMPIrc rc = readArgument(value, type, v);
+    if (rc != CMPI_RC_OK)
+    {
+        return errorStatus(rc);
+    }
+    setNamed(a->args, name, std::move(v));
+    return okStatus();
+}
+
+CMPIData argsGetArg(const CMPIArgs* as, const char* name, CMPIStatus* rc)
+{
+    const ArgsObject* a = ArgsObject::of(as);
+    if (a == nullptr)
+    {
+        setStatus(rc, CMPI_RC_ERR_INVALID_HANDLE);
+        return nullData();
+    }
+    const Value* v = name ? findNamed(a->args, name) : nullptr;
+    if (v == nullptr)
+    {
+        setStatus(rc, name ? CMPI_RC_ERR_NO_SUCH_PROPERTY
+                           : CMPI_RC_ERR_INVALID_PARAMETER);
+        CMPIData d = nullData();
+        d.state |= CMPI_notFound;
+        return d;
+    }
+    setStatus(rc, CMPI_RC_OK);
+    return makeData(*a->broker, *v);
+}
+
+CMPIData argsGetArgAt(const CMPIArgs* as, CMPICount index, CMPIString** name,
+                      CMPIStatus* rc)
+{
+    const ArgsObject* a = ArgsObject::of(as);
+    if (a == nullptr)
+    {
+        setStatus(rc, CMPI_RC_ERR_INVALID_HANDLE);
+        return nullData();
+    }
+    if (index >= a->args.size())
+    {
+        setStatus(rc, CMPI_RC_ERR_NO_SUCH_PROPERTY);
+        return nullData();
+    }
+    const auto& [argName, value] = a->args[index];
+    if (name != nullptr)
+    {
+        auto* s = a->broker->make<StringObject>();
+        s->text = argName;
+        *name = &s->cmpi;
+    }
+    setStatus(rc, CMPI_RC_OK);
+    return makeData(*a->broker, value);
+}
+
+CMPICount argsGetArgCount(const CMPIArgs* as, CMPIStatus* rc)
+{
+    const ArgsObject* a = ArgsObject::of(as);
+    setStatus(rc, a ? CMPI_RC_OK : CMPI_RC_ERR_INVALID_HANDLE);
+    return a ? static_cast<CMPICount>(a->args.size()) : 0;
+}
+
+} // namespace
+
+CMPIArgsFT argsFT = {
+    200,        argsRelease,  argsClone,       argsAddArg,
+    argsGetArg, argsGetArgAt, argsGetArgCount,
+};
+
+} // namespace host::detail

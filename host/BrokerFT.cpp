@@ -1,0 +1,214 @@
+// Up-calls: thread attachment and indication delivery work; the operations
+// a provider could ask of the object manager are not offered.
+#include "BrokerState.h"
+#include "Objects.h"
+
+namespace host::detail
+{
+namespace
+{
+
+CMPIContext* prepareAttachThread(const CMPIBroker* mb, const CMPIContext* ctx)
+{
+    BrokerState* b = BrokerState::of(mb);
+    if (b == nullptr)
+    {
+        return nullptr;
+    }
+    const auto fault = b->fault(BrokerCall::PrepareAttachThread);
+    const ContextObject* source = ContextObject::of(ctx);
+    if (source == nullptr || (fault && fault != FaultMode::NullHandle))
+    {
+        return nullptr;
+    }
+    // Outlives the request: a provider thread keeps using it.
+    auto* prepared = b->makeOwned<ContextObject>(Ownership::Prepared);
+    prepared->entries = source->entries;
+    return deliver(prepared, fault, nullptr);
+}
+
+CMPIStatus attachThread(const CMPIBroker* mb, const CMPIContext* ctx)
+{
+    BrokerState* b = BrokerState::of(mb);
+    if (b == nullptr)
+    {
+        return errorStatus(CMPI_RC_ERR_INVALID_HANDLE);
+    }
+    if (b->fault(BrokerCall::AttachThread))
+    {
+        return errorStatus(CMPI_RC_ERR_FAILED);
+    }
+    return b->attach(ctx);
+}
+
+CMPIStatus detachThread(const CMPIBroker* mb, const CMPIContext* ctx)
+{
+    BrokerState* b = BrokerState::of(mb);
+    return b ? b->detach(ctx) : errorStatus(CMPI_RC_ERR_INVALID_HANDLE);
+}
+
+CMPIStatus deliverIndication(const CMPIBroker* mb, const CMPIContext* ctx,
+                             const char* ns, const CMPIInstance* ind)
+{
+    BrokerState* b = BrokerState::of(mb);
+    if (b == nullptr)
+    {
+        return errorStatus(CMPI_RC_ERR_INVALID_HANDLE);
+    }
+    if (b->fault(BrokerCall::DeliverIndication))
+    {
+        return errorStatus(CMPI_RC_ERR_FAILED);
+    }
+    if (!b->isLiveContext(ctx))
+    {
+        return errorStatus(CMPI_RC_ERR_INVALID_HANDLE);
+    }
+    if (ns == nullptr || ind == nullptr)
+    {
+        return errorStatus(CMPI_RC_ERR_INVALID_PARAMETER);
+    }
+    const InstanceObject* i = InstanceObject::of(ind);
+    if (i == nullptr)
+    {
+        return errorStatus(CMPI_RC_ERR_INVALID_HANDLE);
+    }
+    DeliveredIndication delivered{ns, i->snapshot()};
+    const std::lock_guard lock(b->indicationMutex);
+    b->indications.push_back(std::move(delivered));
+    return okStatus();
+}
+
+CMPIEnumeration* enumerateInstanceNames(const CMPIBroker*, const CMPIContext*,
+                                        const CMPIObjectPath*, CMPIStatus* rc)
+{
+    setStatus(rc, CMPI_RC_ERR_NOT_SUPPORTED);
+    return nullptr;
+}
+
+CMPIInstance* getInstance(const CMPIBroker*, const CMPIContext*,
+                          const CMPIObjectPath*, const char**, CMPIStatus* rc)
+{
+    setStatus(rc, CMPI_RC_ERR_NOT_SUPPORTED);
+    return nullptr;
+}
+
+CMPIObjectPath* createInstance(const CMPIBroker*, const CMPIContext*,
+                               const CMPIObjectPath*, const CMPIInstance*,
+                               CMPIStatus* rc)
+{
+    setStatus(rc, CMPI_RC_ERR_NOT_SUPPORTED);
+    return nullptr;
+}
+
+CMPIStatus modifyInstance(const CMPIBroker*, const CMPIContext*,
+                          const CMPIObjectPath*, const CMPIInstance*,
+                          const char**)
+{
+    return errorStatus(CMPI_RC_ERR_NOT_SUPPORTED);
+}
+
+CMPIStatus deleteInstance(const CMPIBroker*, const CMPIContext*,
+                          const CMPIObjectPath*)
+{
+    return errorStatus(CMPI_RC_ERR_NOT_SUPPORTED);
+}
+
+CMPIEnumeration* execQuery(const CMPIBroker*, const CMPIContext*,
+                           const CMPIObjectPath*, const char*, const char*,
+                           CMPIStatus* rc)
+{
+    setStatus(rc, CMPI_RC_ERR_NOT_SUPPORTED);
+    return nullptr;
+}
+
+CMPIEnumeration* enumerateInstances(const CMPIBroker*, const CMPIContext*,
+                                    const CMPIObjectPath*, const char**,
+                                    CMPIStatus* rc)
+{
+    setStatus(rc, CMPI_RC_ERR_NOT_SUPPORTED);
+    return nullptr;
+}
+
+CMPIEnumeration* associators(const CMPIBroker*, const CMPIContext*,
+                             const CMPIObjectPath*, const char*, const char*,
+                             const char*, const char*, const char**,
+                             CMPIStatus* rc)
+{
+    setStatus(rc, CMPI_RC_ERR_NOT_SUPPORTED);
+    return nullptr;
+}
+
+CMPIEnumeration* associatorNames(const CMPIBroker*, const CMPIContext*,
+                                 const CMPIObjectPath*, const char*,
+                                 const char*, const char*, const char*,
+                                 CMPIStatus* rc)
+{
+    setStatus(rc, CMPI_RC_ERR_NOT_SUPPORTED);
+    return nullptr;
+}
+
+CMPIEnumeration* references(const CMPIBroker*, const CMPIContext*,
+                            const CMPIObjectPath*, const char*, const char*,
+                            const char**, CMPIStatus* rc)
+{
+    setStatus(rc, CMPI_RC_ERR_NOT_SUPPORTED);
+    return nullptr;
+}
+
+CMPIEnumeration* referenceNames(const CMPIBroker*, const CMPIContext*,
+                                const CMPIObjectPath*, const char*, const char*,
+                                CMPIStatus* rc)
+{
+    setStatus(rc, CMPI_RC_ERR_NOT_SUPPORTED);
+    return nullptr;
+}
+
+CMPIData invokeMethod(const CMPIBroker*, const CMPIContext*,
+                      const CMPIObjectPath*, const char*, const CMPIArgs*,
+                      CMPIArgs*, CMPIStatus* rc)
+{
+    setStatus(rc, CMPI_RC_ERR_NOT_SUPPORTED);
+    return nullData();
+}
+
+CMPIStatus setProperty(const CMPIBroker*, const CMPIContext*,
+                       const CMPIObjectPath*, const char*, const CMPIValue*,
+                       CMPIType)
+{
+    return errorStatus(CMPI_RC_ERR_NOT_SUPPORTED);
+}
+
+CMPIData getProperty(const CMPIBroker*, const CMPIContext*,
+                     const CMPIObjectPath*, const char*, CMPIStatus* rc)
+{
+    setStatus(rc, CMPI_RC_ERR_NOT_SUPPORTED);
+    return nullData();
+}
+
+} // namespace
+
+CMPIBrokerFT brokerFT = {
+    CMPI_MB_Class_0 | CMPI_MB_Supports_IndicationMI,
+    0, // like SFCB: providers must not rely on a broker version
+    "selhost",
+    prepareAttachThread,
+    attachThread,
+    detachThread,
+    deliverIndication,
+    enumerateInstanceNames,
+    getInstance,
+    createInstance,
+    modifyInstance,
+    deleteInstance,
+    execQuery,
+    enumerateInstances,
+    associators,
+    associatorNames,
+    references,
+    referenceNames,
+    invokeMethod,
+    setProperty,
+    getProperty,
+};
+
+} // namespace host::detail

@@ -1,0 +1,228 @@
+#include "BrokerState.h"
+
+#include <algorithm>
+
+namespace host::detail
+{
+namespace
+{
+
+struct Scope
+{
+    BrokerState* broker;
+    Arena* arena;
+    const CMPIContext* attached;
+};
+
+// Innermost last. A request or an attachment is open on one thread only.
+thread_local std::vector<Scope> scopes;
+
+std::mutex liveMutex;
+std::vector<BrokerState*> liveBrokers;
+
+} // namespace
+
+Arena::~Arena()
+{
+    clear();
+}
+
+void Arena::adopt(std::unique_ptr<Object> object)
+{
+    const std::lock_guard lock(mutex_);
+    objects_.push_back(std::move(object));
+}
+
+std::size_t Arena::size() const
+{
+    const std::lock_guard lock(mutex_);
+    return objects_.size();
+}
+
+void Arena::clear()
+{
+    std::vector<std::unique_ptr<Object>> doomed;
+    {
+        const std::lock_guard lock(mutex_);
+        doomed.swap(objects_);
+    }
+    while (!doomed.empty())
+    {
+        doomed.pop_back();
+    }
+}
+
+ContextObject::ContextObject(BrokerState& state) : Encapsulated(state)
+{
+    state.registerContext(&cmpi);
+}
+
+ContextObject::~ContextObject()
+{
+    broker->unregisterContext(&cmpi);
+}
+
+BrokerState::BrokerState(Schema s) : schema(std::move(s))
+{
+    cmpi.hdl = this;
+    cmpi.bft = &brokerFT;
+    cmpi.eft = &brokerEncFT;
+    cmpi.xft = &brokerExtFT;
+    cmpi.mft = nullptr;
+    const std::lock_guard lock(liveMutex);
+    liveBrokers.push_back(this);
+}
+
+BrokerState::~BrokerState()
+{
+    {
+        const std::lock_guard lock(liveMutex);
+        std::erase(liveBrokers, this);
+    }
+    brokerArena.clear();
+    {
+        const std::lock_guard lock(attachMutex);
+        attachArenas.clear();
+    }
+    std::map<Object*, std::unique_ptr<Object>> doomed;
+    {
+        const std::lock_guard lock(ownedMutex);
+        doomed.swap(owned);
+    }
+    doomed.clear();
+    // Drop any scope this thread still has for this broker.
+    std::erase_if(scopes, [this](const Scope& s) { return s.broker == this; });
+}
+
+BrokerState* BrokerState::of(const CMPIBroker* mb)
+{
+    if (mb == nullptr || mb->hdl == nullptr || mb->bft != &brokerFT)
+    {
+        return nullptr;
+    }
+    return static_cast<BrokerState*>(mb->hdl);
+}
+
+BrokerState* BrokerState::forThisThread()
+{
+    if (!scopes.empty())
+    {
+        return scopes.back().broker;
+    }
+    const std::lock_guard lock(liveMutex);
+    return liveBrokers.size() == 1 ? liveBrokers.front() : nullptr;
+}
+
+CMPIStatus BrokerState::release(Object* object)
+{
+    if (object->ownership == Ownership::Arena)
+    {
+        return okStatus();
+    }
+    std::unique_ptr<Object> doomed;
+    {
+        const std::lock_guard lock(ownedMutex);
+        const auto it = owned.find(object);
+        if (it == owned.end())
+        {
+            return errorStatus(CMPI_RC_ERR_INVALID_HANDLE);
+        }
+        doomed = std::move(it->second);
+        owned.erase(it);
+    }
+    return okStatus();
+}
+
+Arena& BrokerState::currentArena()
+{
+    for (auto it = scopes.rbegin(); it != scopes.rend(); ++it)
+    {
+        if (it->broker == this)
+        {
+            return *it->arena;
+        }
+    }
+    return brokerArena;
+}
+
+void BrokerState::pushScope(Arena* arena, const CMPIContext* attached)
+{
+    scopes.push_back({this, arena, attached});
+}
+
+void BrokerState::popScope(Arena* arena)
+{
+    for (auto it = scopes.rbegin(); it != scopes.rend(); ++it)
+    {
+        if (it->broker == this && it->arena == arena)
+        {
+            scopes.erase(std::next(it).base());
+            return;
+        }
+    }
+}
+
+CMPIStatus BrokerState::attach(const CMPIContext* ctx)
+{
+    if (!isLiveContext(ctx))
+    {
+        return errorStatus(CMPI_RC_ERR_INVALID_HANDLE);
+    }
+    Arena* arena = nullptr;
+    {
+        const std::lock_guard lock(attachMutex);
+        arena = &attachArenas.emplace_back();
+    }
+    pushScope(arena, ctx);
+    return okStatus();
+}
+
+CMPIStatus BrokerState::detach(const CMPIContext* ctx)
+{
+    if (!isLiveContext(ctx))
+    {
+        return errorStatus(CMPI_RC_ERR_INVALID_HANDLE);
+    }
+    for (auto it = scopes.rbegin(); it != scopes.rend(); ++it)
+    {
+        if (it->broker == this && it->attached == ctx)
+        {
+            Arena* arena = it->arena;
+            scopes.erase(std::next(it).base());
+            std::list<Arena> doomed;
+            {
+                const std::lock_guard lock(attachMutex);
+                const auto found = std::find_if(
+                    attachArenas.begin(), attachArenas.end(),
+                    [arena](const Arena& a) { return &a == arena; });
+                if (found != attachArenas.end())
+                {
+                    doomed.splice(doomed.begin(), attachArenas, found);
+                }
+            }
+            break;
+        }
+    }
+    return okStatus();
+}
+
+void BrokerState::registerContext(const CMPIContext* ctx)
+{
+    const std::lock_guard lock(contextMutex);
+    contexts.insert(ctx);
+}
+
+void BrokerState::unregisterContext(const CMPIContext* ctx)
+{
+    const std::lock_guard lock(contextMutex);
+    contexts.erase(ctx);
+}
+
+bool BrokerState::isLiveContext(const CMPIContext* ctx) const
+{
+    // Look the pointer up before touching it: it may be stale.
+    const std::lock_guard lock(contextMutex);
+    return contexts.count(ctx) != 0 && ContextObject::of(ctx) != nullptr;
+}
+
+} // namespace host::detail

@@ -1,0 +1,118 @@
+// Shared state of one broker: what its function tables reach through the
+// CMPIBroker handle and through every object's back pointer.
+#pragma once
+
+#include "Faults.h"
+#include "Objects.h"
+#include "Schema.h"
+#include "Values.h"
+
+#include <cmpift.h>
+
+#include <list>
+#include <map>
+#include <memory>
+#include <mutex>
+#include <optional>
+#include <unordered_set>
+#include <vector>
+
+namespace host::detail
+{
+
+extern CMPIBrokerFT brokerFT;
+extern CMPIBrokerEncFT brokerEncFT;
+extern CMPIBrokerExtFT brokerExtFT;
+
+struct BrokerState
+{
+    explicit BrokerState(Schema s);
+    ~BrokerState();
+    BrokerState(const BrokerState&) = delete;
+    BrokerState& operator=(const BrokerState&) = delete;
+
+    static BrokerState* of(const CMPIBroker* mb);
+    // For calls without a broker handle (newThread): the broker of the
+    // innermost request or attachment on this thread, else the only live
+    // broker, else nullptr.
+    static BrokerState* forThisThread();
+
+    // A new object owned by the arena in scope on this thread: the open
+    // request, the attached thread's arena, or else the broker's own.
+    template <typename T>
+    T* make()
+    {
+        auto object = std::make_unique<T>(*this);
+        T* raw = object.get();
+        currentArena().adopt(std::move(object));
+        return raw;
+    }
+    // A new object that lives until release() or the broker's end.
+    template <typename T>
+    T* makeOwned(Ownership ownership)
+    {
+        auto object = std::make_unique<T>(*this);
+        object->ownership = ownership;
+        T* raw = object.get();
+        const std::lock_guard lock(ownedMutex);
+        owned.emplace(raw, std::move(object));
+        return raw;
+    }
+    // Frees clones and prepared contexts; harmless for arena objects.
+    CMPIStatus release(Object* object);
+
+    Arena& currentArena();
+    void pushScope(Arena* arena, const CMPIContext* attached);
+    void popScope(Arena* arena);
+    CMPIStatus attach(const CMPIContext* ctx);
+    CMPIStatus detach(const CMPIContext* ctx);
+
+    void registerContext(const CMPIContext* ctx);
+    void unregisterContext(const CMPIContext* ctx);
+    bool isLiveContext(const CMPIContext* ctx) const;
+
+    std::optional<FaultMode> fault(BrokerCall call)
+    {
+        return faults.record(call);
+    }
+
+    // Declared first so it outlives every context freed below.
+    mutable std::mutex contextMutex;
+    std::unordered_set<const CMPIContext*> contexts;
+
+    CMPIBroker cmpi{};
+    Schema schema;
+    FaultPlan faults;
+
+    mutable std::mutex traceMutex;
+    std::vector<TraceRecord> traces;
+    std::vector<LogRecord> logs;
+
+    mutable std::mutex indicationMutex;
+    std::vector<DeliveredIndication> indications;
+
+    mutable std::mutex ownedMutex;
+    std::map<Object*, std::unique_ptr<Object>> owned;
+
+    mutable std::mutex attachMutex;
+    std::list<Arena> attachArenas;
+
+    Arena brokerArena;
+};
+
+// Hands a freshly made object to the provider, applying a planned fault:
+// NullHandle clears its hdl, FailStatus reports CMPI_RC_ERR_FAILED with the
+// real object. (ReturnNull is handled before anything is made.)
+template <typename T>
+auto* deliver(T* object, std::optional<FaultMode> fault, CMPIStatus* rc)
+{
+    if (fault == FaultMode::NullHandle)
+    {
+        object->cmpi.hdl = nullptr;
+    }
+    setStatus(rc,
+              fault == FaultMode::FailStatus ? CMPI_RC_ERR_FAILED : CMPI_RC_OK);
+    return &object->cmpi;
+}
+
+} // namespace host::detail

@@ -1,0 +1,136 @@
+#include "BrokerState.h"
+#include "Objects.h"
+#include "ValueConversion.h"
+
+#include <cstring>
+
+namespace host::detail
+{
+namespace
+{
+
+using Ctx = ContextObject;
+
+const Value* findEntry(const Ctx& c, const char* name)
+{
+    for (const auto& [n, v] : c.entries)
+    {
+        if (n == name)
+        {
+            return &v;
+        }
+    }
+    return nullptr;
+}
+
+CMPIStatus ctxRelease(CMPIContext* ctx)
+{
+    Ctx* c = Ctx::of(ctx);
+    return c ? c->broker->release(c) : errorStatus(CMPI_RC_ERR_INVALID_HANDLE);
+}
+
+CMPIContext* ctxClone(const CMPIContext* ctx, CMPIStatus* rc)
+{
+    const Ctx* c = Ctx::of(ctx);
+    if (c == nullptr)
+    {
+        setStatus(rc, CMPI_RC_ERR_INVALID_HANDLE);
+        return nullptr;
+    }
+    auto* copy = c->broker->makeOwned<Ctx>(Ownership::Clone);
+    copy->entries = c->entries;
+    setStatus(rc, CMPI_RC_OK);
+    return &copy->cmpi;
+}
+
+CMPIData ctxGetEntry(const CMPIContext* ctx, const char* name, CMPIStatus* rc)
+{
+    const Ctx* c = Ctx::of(ctx);
+    if (c == nullptr)
+    {
+        setStatus(rc, CMPI_RC_ERR_INVALID_HANDLE);
+        return nullData();
+    }
+    const Value* v = name ? findEntry(*c, name) : nullptr;
+    if (v == nullptr)
+    {
+        setStatus(rc, name ? CMPI_RC_ERR_NO_SUCH_PROPERTY
+                           : CMPI_RC_ERR_INVALID_PARAMETER);
+        CMPIData d = nullData();
+        d.state |= CMPI_notFound;
+        return d;
+    }
+    setStatus(rc, CMPI_RC_OK);
+    return makeData(*c->broker, *v);
+}
+
+CMPIData ctxGetEntryAt(const CMPIContext* ctx, CMPICount index,
+                       CMPIString** name, CMPIStatus* rc)
+{
+    const Ctx* c = Ctx::of(ctx);
+    if (c == nullptr)
+    {
+        setStatus(rc, CMPI_RC_ERR_INVALID_HANDLE);
+        return nullData();
+    }
+    if (index >= c->entries.size())
+    {
+        setStatus(rc, CMPI_RC_ERR_NO_SUCH_PROPERTY);
+        return nullData();
+    }
+    const auto& [entryName, value] = c->entries[index];
+    if (name != nullptr)
+    {
+        auto* s = c->broker->make<StringObject>();
+        s->text = entryName;
+        *name = &s->cmpi;
+    }
+    setStatus(rc, CMPI_RC_OK);
+    return makeData(*c->broker, value);
+}
+
+CMPICount ctxGetEntryCount(const CMPIContext* ctx, CMPIStatus* rc)
+{
+    const Ctx* c = Ctx::of(ctx);
+    setStatus(rc, c ? CMPI_RC_OK : CMPI_RC_ERR_INVALID_HANDLE);
+    return c ? static_cast<CMPICount>(c->entries.size()) : 0;
+}
+
+CMPIStatus ctxAddEntry(const CMPIContext* ctx, const char* name,
+                       const CMPIValue* value, const CMPIType type)
+{
+    Ctx* c = Ctx::of(ctx);
+    if (c == nullptr)
+    {
+        return errorStatus(CMPI_RC_ERR_INVALID_HANDLE);
+    }
+    if (name == nullptr)
+    {
+        return errorStatus(CMPI_RC_ERR_INVALID_PARAMETER);
+    }
+    Value v;
+    const CMPIrc rc = readArgument(value, type, v);
+    if (rc != CMPI_RC_OK)
+    {
+        return errorStatus(rc);
+    }
+    for (auto& [n, existing] : c->entries)
+    {
+        if (n == name)
+        {
+            existing = std::move(v);
+            return okStatus();
+        }
+    }
+    c->entries.emplace_back(name, std::move(v));
+    return okStatus();
+}
+
+} // namespace
+
+CMPIContextFT contextFT = {
+    200,           ctxRelease,       ctxClone,    ctxGetEntry,
+    ctxGetEntryAt, ctxGetEntryCount, ctxAddEntry,
+};
+
+} // namespace host::detail

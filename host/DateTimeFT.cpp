@@ -1,0 +1,80 @@
+#include "BrokerState.h"
+#include "DateTimeText.h"
+#include "Objects.h"
+
+namespace host::detail
+{
+namespace
+{
+
+CMPIStatus dateTimeRelease(CMPIDateTime* dt)
+{
+    DateTimeObject* d = DateTimeObject::of(dt);
+    return d ? d->broker->release(d) : errorStatus(CMPI_RC_ERR_INVALID_HANDLE);
+}
+
+CMPIDateTime* dateTimeClone(const CMPIDateTime* dt, CMPIStatus* rc)
+{
+    const DateTimeObject* d = DateTimeObject::of(dt);
+    if (d == nullptr)
+    {
+        setStatus(rc, CMPI_RC_ERR_INVALID_HANDLE);
+        return nullptr;
+    }
+    auto* copy = d->broker->makeOwned<DateTimeObject>(Ownership::Clone);
+    copy->text = d->text;
+    setStatus(rc, CMPI_RC_OK);
+    return &copy->cmpi;
+}
+
+CMPIUint64 dateTimeGetBinaryFormat(const CMPIDateTime* dt, CMPIStatus* rc)
+{
+    const DateTimeObject* d = DateTimeObject::of(dt);
+    if (d == nullptr)
+    {
+        setStatus(rc, CMPI_RC_ERR_INVALID_HANDLE);
+        return 0;
+    }
+    const auto binary = cimDateTimeToBinary(d->text);
+    setStatus(rc, binary ? CMPI_RC_OK : CMPI_RC_ERR_INVALID_PARAMETER);
+    return binary.value_or(0);
+}
+
+CMPIString* dateTimeGetStringFormat(const CMPIDateTime* dt, CMPIStatus* rc)
+{
+    const DateTimeObject* d = DateTimeObject::of(dt);
+    if (d == nullptr)
+    {
+        setStatus(rc, CMPI_RC_ERR_INVALID_HANDLE);
+        return nullptr;
+    }
+    auto* s = d->broker->make<StringObject>();
+    s->text = d->text;
+    setStatus(rc, CMPI_RC_OK);
+    return &s->cmpi;
+}
+
+CMPIBoolean dateTimeIsInterval(const CMPIDateTime* dt, CMPIStatus* rc)
+{
+    const DateTimeObject* d = DateTimeObject::of(dt);
+    if (d == nullptr)
+    {
+        setStatus(rc, CMPI_RC_ERR_INVALID_HANDLE);
+        return 0;
+    }
+    setStatus(rc, CMPI_RC_OK);
+    return d->text.size() > 21 && d->text[21] == ':';
+}
+
+} // namespace
+
+CMPIDateTimeFT dateTimeFT = {
+    200,
+    dateTimeRelease,
+    dateTimeClone,
+    dateTimeGetBinaryFormat,
+    dateTimeGetStringFormat,
+    dateTimeIsInterval,
+};
+
+} // namespace host::detail

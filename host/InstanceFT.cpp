@@ -1,0 +1,253 @@
+#include "BrokerState.h"
+#include "Names.h"
+#include "Objects.h"
+#include "ValueConversion.h"
+
+#include <algorithm>
+
+namespace host::detail
+{
+
+bool InstanceObject::accepts(std::string_view name) const
+{
+    if (!filter)
+    {
+        return true;
+    }
+    const auto matches = [name](const std::string& n)
+    { return sameName(n, name); };
+    return std::any_of(filter->begin(), filter->end(), matches) ||
+           std::any_of(filterKeys.begin(), filterKeys.end(), matches);
+}
+
+ObjectPath InstanceObject::effectivePath() const
+{
+    ObjectPath result = path;
+    const ClassKeys* keys = broker->schema.find(path.className);
+    if (keys == nullptr)
+    {
+        return result;
+    }
+    NamedValues ordered;
+    for (const auto& [keyName, type] : keys->keys)
+    {
+        const Value* property = findNamed(properties, keyName);
+        if (property != nullptr && !property->null)
+        {
+            ordered.emplace_back(keyName, *property);
+        }
+        else if (const Value* key = path.key(keyName))
+        {
+            ordered.emplace_back(keyName, *key);
+        }
+    }
+    for (const auto& [keyName, value] : path.keys)
+    {
+        if (!keys->isKey(keyName))
+        {
+            ordered.emplace_back(keyName, value);
+        }
+    }
+    result.keys = std::move(ordered);
+    return result;
+}
+
+Instance InstanceObject::snapshot() const
+{
+    return Instance{effectivePath(), properties};
+}
+
+namespace
+{
+
+using Inst = InstanceObject;
+
+CMPIStatus instRelease(CMPIInstance* inst)
+{
+    Inst* i = Inst::of(inst);
+    return i ? i->broker->release(i) : errorStatus(CMPI_RC_ERR_INVALID_HANDLE);
+}
+
+CMPIInstance* instClone(const CMPIInstance* inst, CMPIStatus* rc)
+{
+    const Inst* i = Inst::of(inst);
+    if (i == nullptr)
+    {
+        setStatus(rc, CMPI_RC_ERR_INVALID_HANDLE);
+        return nullptr;
+    }
+    auto* copy = i->broker->makeOwned<Inst>(Ownership::Clone);
+    copy->path = i->path;
+    copy->properties = i->properties;
+    copy->filter = i->filter;
+    copy->filterKeys = i->filterKeys;
+    setStatus(rc, CMPI_RC_OK);
+    return &copy->cmpi;
+}
+
+CMPIData instGetProperty(const CMPIInstance* inst, const char* name,
+                         CMPIStatus* rc)
+{
+    const Inst* i = Inst::of(inst);
+    if (i == nullptr)
+    {
+        setStatus(rc, CMPI_RC_ERR_INVALID_HANDLE);
+        return nullData();
+    }
+    const Value* v = name ? findNamed(i->properties, name) : nullptr;
+    if (v == nullptr)
+    {
+        setStatus(rc, name ? CMPI_RC_ERR_NO_SUCH_PROPERTY
+                           : CMPI_RC_ERR_INVALID_PARAMETER);
+        CMPIData d = nullData();
+        d.state |= CMPI_notFound;
+        return d;
+    }
+    setStatus(rc, CMPI_RC_OK);
+    return makeData(*i->broker, *v);
+}
+
+CMPIData instGetPropertyAt(const CMPIInstance* inst, CMPICount index,
+                           CMPIString** name, CMPIStatus* rc)
+{
+    const Inst* i = Inst::of(inst);
+    if (i == nullptr)
+    {
+        setStatus(rc, CMPI_RC_ERR_INVALID_HANDLE);
+        return nullData();
+    }
+    if (index >= i->properties.size())
+    {
+        setStatus(rc, CMPI_RC_ERR_NO_SUCH_PROPERTY);
+        return nullData();
+    }
+    const auto& [propertyName, value] = i->properties[index];
+    if (name != nullptr)
+    {
+        auto* s = i->broker->make<StringObject>();
+        s->text = propertyName;
+        *name = &s->cmpi;
+    }
+    setStatus(rc, CMPI_RC_OK);
+    return makeData(*i->broker, value);
+}
+
+CMPICount instGetPropertyCount(const CMPIInstance* inst, CMPIStatus* rc)
+{
+    const Inst* i = Inst::of(inst);
+    setStatus(rc, i ? CMPI_RC_OK : CMPI_RC_ERR_INVALID_HANDLE);
+    return i ? static_cast<CMPICount>(i->properties.size()) : 0;
+}
+
+CMPIStatus instSetProperty(const CMPIInstance* inst, const char* name,
+                           const CMPIValue* value, CMPIType type)
+{
+    Inst* i = Inst::of(inst);
+    if (i == nullptr)
+    {
+        return errorStatus(CMPI_RC_ERR_INVALID_HANDLE);
+    }
+    if (i->broker->fault(BrokerCall::SetProperty))
+    {
+        return errorStatus(CMPI_RC_ERR_FAILED);
+    }
+    if (name == nullptr)
+    {
+        return errorStatus(CMPI_RC_ERR_INVALID_PARAMETER);
+    }
+    Value v;
+    const CMPIrc rc = readArgument(value, type, v);
+    if (rc != CMPI_RC_OK)
+    {
+        return errorStatus(rc);
+    }
+    if (i->accepts(name))
+    {
+        setNamed(i->properties, name, std::move(v));
+    }
+    return okStatus();
+}
+
+CMPIObjectPath* instGetObjectPath(const CMPIInstance* inst, CMPIStatus* rc)
+{
+    const Inst* i = Inst::of(inst);
+    if (i == nullptr)
+    {
+        setStatus(rc, CMPI_RC_ERR_INVALID_HANDLE);
+        return nullptr;
+    }
+    auto* p = i->broker->make<ObjectPathObject>();
+    p->path = i->effectivePath();
+    setStatus(rc, CMPI_RC_OK);
+    return &p->cmpi;
+}
+
+std::vector<std::string> nameList(const char** names)
+{
+    std::vector<std::string> list;
+    for (; names != nullptr && *names != nullptr; ++names)
+    {
+        list.emplace_back(*names);
+    }
+    return list;
+}
+
+CMPIStatus instSetPropertyFilter(CMPIInstance* inst, const char** properties,
+                                 const char** keys)
+{
+    Inst* i = Inst::of(inst);
+    if (i == nullptr)
+    {
+        return errorStatus(CMPI_RC_ERR_INVALID_HANDLE);
+    }
+    if (properties == nullptr)
+    {
+        i->filter.reset();
+        i->filterKeys.clear();
+        return okStatus();
+    }
+    i->filter = nameList(properties);
+    i->filterKeys = nameList(keys);
+    std::erase_if(i->properties,
+                  [i](const auto& p) { return !i->accepts(p.first); });
+    return okStatus();
+}
+
+CMPIStatus instSetObjectPath(CMPIInstance* inst, const CMPIObjectPath* op)
+{
+    Inst* i = Inst::of(inst);
+    if (i == nullptr)
+    {
+        return errorStatus(CMPI_RC_ERR_INVALID_HANDLE);
+    }
+    if (op == nullptr)
+    {
+        return errorStatus(CMPI_RC_ERR_INVALID_PARAMETER);
+    }
+    const ObjectPathObject* p = ObjectPathObject::of(op);
+    if (p == nullptr)
+    {
+        return errorStatus(CMPI_RC_ERR_INVALID_HANDLE);
+    }
+    i->path = p->path;
+    return okStatus();
+}
+
+} // namespace
+
+// setPropertyWithOrigin stays NULL, as in SFCB.
+CMPIInstanceFT instanceFT = {
+    200,
+    instRelease,
+    instClone,
+    instGetProperty,
+    instGetPropertyAt,
+    instGetPropertyCount,
+    instSetProperty,
+    instGetObjectPath,
+    instSetPropertyFilter,
+    instSetObjectPath,
+    nullptr,
+};
+
+} // namespace host::detail

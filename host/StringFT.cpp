@@ -1,0 +1,56 @@
+#include "BrokerState.h"
+#include "Objects.h"
+
+namespace host::detail
+{
+namespace
+{
+
+CMPIStatus stringRelease(CMPIString* st)
+{
+    StringObject* s = StringObject::of(st);
+    return s ? s->broker->release(s) : errorStatus(CMPI_RC_ERR_INVALID_HANDLE);
+}
+
+CMPIString* stringClone(const CMPIString* st, CMPIStatus* rc)
+{
+    const StringObject* s = StringObject::of(st);
+    if (s == nullptr)
+    {
+        setStatus(rc, CMPI_RC_ERR_INVALID_HANDLE);
+        return nullptr;
+    }
+    auto* copy = s->broker->makeOwned<StringObject>(Ownership::Clone);
+    copy->text = s->text;
+    setStatus(rc, CMPI_RC_OK);
+    return &copy->cmpi;
+}
+
+const char* stringGetCharPtr(const CMPIString* st, CMPIStatus* rc)
+{
+    const StringObject* s = StringObject::of(st);
+    if (s == nullptr)
+    {
+        setStatus(rc, CMPI_RC_ERR_INVALID_HANDLE);
+        return nullptr;
+    }
+    const auto fault = s->broker->fault(BrokerCall::GetCharPtr);
+    if (fault && fault != FaultMode::FailStatus)
+    {
+        setStatus(rc, CMPI_RC_ERR_FAILED);
+        return nullptr;
+    }
+    setStatus(rc, fault ? CMPI_RC_ERR_FAILED : CMPI_RC_OK);
+    return s->text ? s->text->c_str() : nullptr;
+}
+
+} // namespace
+
+CMPIStringFT stringFT = {
+    200,
+    stringRelease,
+    stringClone,
+    stringGetCharPtr,
+};
+
+} // namespace host::detail

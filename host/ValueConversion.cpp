@@ -1,0 +1,308 @@
+#include "ValueConversion.h"
+
+#include "BrokerState.h"
+#include "Objects.h"
+
+namespace host::detail
+{
+namespace
+{
+
+CMPIrc readScalar(const CMPIValue& v, CMPIType type, Value& out)
+{
+    out = Value{};
+    out.type = type;
+    switch (type)
+    {
+        case CMPI_boolean:
+            out.u = v.boolean ? 1 : 0;
+            return CMPI_RC_OK;
+        case CMPI_char16:
+            out.u = v.char16;
+            return CMPI_RC_OK;
+        case CMPI_uint8:
+            out.u = v.uint8;
+            return CMPI_RC_OK;
+        case CMPI_uint16:
+            out.u = v.uint16;
+            return CMPI_RC_OK;
+        case CMPI_uint32:
+            out.u = v.uint32;
+            return CMPI_RC_OK;
+        case CMPI_uint64:
+            out.u = v.uint64;
+            return CMPI_RC_OK;
+        case CMPI_sint8:
+            out.s = v.sint8;
+            return CMPI_RC_OK;
+        case CMPI_sint16:
+            out.s = v.sint16;
+            return CMPI_RC_OK;
+        case CMPI_sint32:
+            out.s = v.sint32;
+            return CMPI_RC_OK;
+        case CMPI_sint64:
+            out.s = v.sint64;
+            return CMPI_RC_OK;
+        case CMPI_real32:
+            out.r = v.real32;
+            return CMPI_RC_OK;
+        case CMPI_real64:
+            out.r = v.real64;
+            return CMPI_RC_OK;
+        case CMPI_string:
+        {
+            if (v.string == nullptr)
+            {
+                out.null = true;
+                return CMPI_RC_OK;
+            }
+            const StringObject* s = StringObject::of(v.string);
+            if (s == nullptr)
+            {
+                return CMPI_RC_ERR_INVALID_HANDLE;
+            }
+            out.null = !s->text.has_value();
+            out.text = s->text.value_or("");
+            return CMPI_RC_OK;
+        }
+        case CMPI_dateTime:
+        {
+            if (v.dateTime == nullptr)
+            {
+                out.null = true;
+                return CMPI_RC_OK;
+            }
+            const DateTimeObject* d = DateTimeObject::of(v.dateTime);
+            if (d == nullptr)
+            {
+                return CMPI_RC_ERR_INVALID_HANDLE;
+            }
+            out.text = d->text;
+            return CMPI_RC_OK;
+        }
+        case CMPI_ref:
+        {
+            if (v.ref == nullptr)
+            {
+                out.null = true;
+                return CMPI_RC_OK;
+            }
+            const ObjectPathObject* p = ObjectPathObject::of(v.ref);
+            if (p == nullptr)
+            {
+                return CMPI_RC_ERR_INVALID_HANDLE;
+            }
+            out.ref = std::make_shared<ObjectPath>(p->path);
+            return CMPI_RC_OK;
+        }
+        case CMPI_instance:
+        case CMPI_args:
+        case CMPI_class:
+        case CMPI_filter:
+        case CMPI_enumeration:
+        case CMPI_ptr:
+        case CMPI_charsptr:
+            return CMPI_RC_ERR_NOT_SUPPORTED;
+        default:
+            return CMPI_RC_ERR_INVALID_DATA_TYPE;
+    }
+}
+
+CMPIrc readArray(const CMPIArray* array, CMPIType type, Value& out)
+{
+    const CMPIType element =
+        storedType(static_cast<CMPIType>(type & ~CMPI_ARRAY));
+    out = Value::nullOf(static_cast<CMPIType>(element | CMPI_ARRAY));
+    if (array == nullptr)
+    {
+        return CMPI_RC_OK;
+    }
+    const ArrayObject* a = ArrayObject::of(array);
+    if (a == nullptr)
+    {
+        return CMPI_RC_ERR_INVALID_HANDLE;
+    }
+    if (a->elementType != element)
+    {
+        return CMPI_RC_ERR_TYPE_MISMATCH;
+    }
+    out.null = false;
+    out.elements = a->elements;
+    return CMPI_RC_OK;
+}
+
+bool isKnownScalar(CMPIType type)
+{
+    switch (type)
+    {
+        case CMPI_boolean:
+        case CMPI_char16:
+        case CMPI_uint8:
+        case CMPI_uint16:
+        case CMPI_uint32:
+        case CMPI_uint64:
+        case CMPI_sint8:
+        case CMPI_sint16:
+        case CMPI_sint32:
+        case CMPI_sint64:
+        case CMPI_real32:
+        case CMPI_real64:
+        case CMPI_string:
+        case CMPI_chars:
+        case CMPI_dateTime:
+        case CMPI_ref:
+            return true;
+        default:
+            return false;
+    }
+}
+
+} // namespace
+
+CMPIrc readArgument(const CMPIValue* value, CMPIType type, Value& out)
+{
+    if (type == CMPI_chars)
+    {
+        out = Value::nullOf(CMPI_string);
+        if (value != nullptr)
+        {
+            out.null = false;
+            out.text = reinterpret_cast<const char*>(value);
+        }
+        return CMPI_RC_OK;
+    }
+    if ((type & CMPI_ARRAY) != 0)
+    {
+        const auto element = static_cast<CMPIType>(type & ~CMPI_ARRAY);
+        if (!isKnownScalar(element))
+        {
+            return CMPI_RC_ERR_INVALID_DATA_TYPE;
+        }
+        return readArray(value ? value->array : nullptr, type, out);
+    }
+    if (value == nullptr)
+    {
+        if (!isKnownScalar(type))
+        {
+            return CMPI_RC_ERR_INVALID_DATA_TYPE;
+        }
+        out = Value::nullOf(type);
+        return CMPI_RC_OK;
+    }
+    return readScalar(*value, type, out);
+}
+
+CMPIrc readData(const CMPIData& data, Value& out)
+{
+    if ((data.state & CMPI_nullValue) != 0)
+    {
+        out = Value::nullOf(data.type);
+        return CMPI_RC_OK;
+    }
+    if (data.type == CMPI_chars)
+    {
+        out = Value::nullOf(CMPI_string);
+        if (data.value.chars != nullptr)
+        {
+            out.null = false;
+            out.text = data.value.chars;
+        }
+        return CMPI_RC_OK;
+    }
+    if ((data.type & CMPI_ARRAY) != 0)
+    {
+        return readArray(data.value.array, data.type, out);
+    }
+    return readScalar(data.value, data.type, out);
+}
+
+CMPIData makeData(BrokerState& broker, const Value& value,
+                  CMPIValueState extraState)
+{
+    CMPIData d{};
+    d.type = value.type;
+    d.state = extraState;
+    if (value.null)
+    {
+        d.state |= CMPI_nullValue;
+        return d;
+    }
+    if (value.isArray())
+    {
+        auto* a = broker.make<ArrayObject>();
+        a->elementType = static_cast<CMPIType>(value.type & ~CMPI_ARRAY);
+        a->elements = value.elements;
+        d.value.array = &a->cmpi;
+        return d;
+    }
+    switch (value.type)
+    {
+        case CMPI_boolean:
+            d.value.boolean = value.u ? 1 : 0;
+            break;
+        case CMPI_char16:
+            d.value.char16 = static_cast<CMPIChar16>(value.u);
+            break;
+        case CMPI_uint8:
+            d.value.uint8 = static_cast<CMPIUint8>(value.u);
+            break;
+        case CMPI_uint16:
+            d.value.uint16 = static_cast<CMPIUint16>(value.u);
+            break;
+        case CMPI_uint32:
+            d.value.uint32 = static_cast<CMPIUint32>(value.u);
+            break;
+        case CMPI_uint64:
+            d.value.uint64 = value.u;
+            break;
+        case CMPI_sint8:
+            d.value.sint8 = static_cast<CMPISint8>(value.s);
+            break;
+        case CMPI_sint16:
+            d.value.sint16 = static_cast<CMPISint16>(value.s);
+            break;
+        case CMPI_sint32:
+            d.value.sint32 = static_cast<CMPISint32>(value.s);
+            break;
+        case CMPI_sint64:
+            d.value.sint64 = value.s;
+            break;
+        case CMPI_real32:
+            d.value.real32 = static_cast<CMPIReal32>(value.r);
+            break;
+        case CMPI_real64:
+            d.value.real64 = value.r;
+            break;
+        case CMPI_string:
+        {
+            auto* s = broker.make<StringObject>();
+            s->text = value.text;
+            d.value.string = &s->cmpi;
+            break;
+        }
+        case CMPI_dateTime:
+        {
+            auto* t = broker.make<DateTimeObject>();
+            t->text = value.text;
+            d.value.dateTime = &t->cmpi;
+            break;
+        }
+        case CMPI_ref:
+        {
+            auto* p = broker.make<ObjectPathObject>();
+            if (value.ref)
+            {
+                p->path = *value.ref;
+            }
+            d.value.ref = &p->cmpi;
+            break;
+        }
+        default:
+            d.state |= CMPI_nullValue;
+            break;
+    }
+    return d;
+}
+
+} // namespace host::detail

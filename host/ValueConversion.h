@@ -1,0 +1,28 @@
+// Moving values between CMPI's C representation and host::Value.
+#pragma once
+
+#include "Values.h"
+
+#include <cmpift.h>
+
+namespace host::detail
+{
+
+struct BrokerState;
+
+// Reads a (value, type) argument the way SFCB and OpenPegasus read those
+// of setProperty, addKey, addEntry, addArg, returnData and setElementAt:
+// for CMPI_chars the value pointer itself is the char*, for every other
+// type the matching CMPIValue member is read; a NULL value means a null
+// value. Returns CMPI_RC_OK or the error to report.
+CMPIrc readArgument(const CMPIValue* value, CMPIType type, Value& out);
+
+// Copies a CMPIData (as returned by getProperty and friends) into a Value.
+CMPIrc readData(const CMPIData& data, Value& out);
+
+// A CMPIData for a stored value; strings, datetimes, paths and arrays are
+// new objects in the current arena.
+CMPIData makeData(BrokerState& broker, const Value& value,
+                  CMPIValueState extraState = CMPI_goodValue);
+
+} // namespace host::detail

@@ -1,0 +1,113 @@
+// The selprov command's exit codes for bad command lines and libraries that
+// cannot be loaded (neither needs a working provider).
+#include <array>
+#include <cstdio>
+#include <string>
+#include <sys/wait.h>
+#include <unistd.h>
+
+#include <gtest/gtest.h>
+
+namespace hosttest
+{
+namespace
+{
+
+struct CommandRun
+{
+    int exitCode = -1;
+    std::string output; // stdout and stderr together
+};
+
+std::string selprovPath()
+{
+#ifdef SELPROV_BIN_DIR
+    return std::string(SELPROV_BIN_DIR) + "/selprov";
+#else
+    return "";
+#endif
+}
+
+CommandRun run(const std::string& args)
+{
+    CommandRun r;
+    const std::string command = selprovPath() + " " + args + " 2>&1";
+    FILE* pipe = popen(command.c_str(), "r");
+    if (pipe == nullptr)
+    {
+        return r;
+    }
+    std::array<char, 512> buf{};
+    std::size_t n = 0;
+    while ((n = fread(buf.data(), 1, buf.size(), pipe)) > 0)
+    {
+        r.output.append(buf.data(), n);
+    }
+    const int status = pclose(pipe);
+    r.exitCode = WIFEXITED(status) ? WEXITSTATUS(status) : -1;
+    return r;
+}
+
+class SelprovCommand : public ::testing::Test
+{
+  protected:
+    void SetUp() override
+    {
+        if (selprovPath().empty() || access(selprovPath().c_str(), X_OK) != 0)
+        {
+            GTEST_SKIP() << "selprov is not built";
+        }
+    }
+};
+
+TEST_F(SelprovCommand, HelpExitsZero)
+{
+    const CommandRun r = run("--help");
+    EXPECT_EQ(r.exitCode, 0);
+    EXPECT_NE(r.output.find("usage: selprov"), std::string::npos);
+}
+
+TEST_F(SelprovCommand, UsageErrorsExitTwo)
+{
+    const char* bad[] = {
+        "",
+        "bogus",
+        "--frobnicate enumerate X",
+        "enumerate",
+        "enumerate 9Bad",
+        "enumerate X extra",
+        "enumerate X --properties A,,B",
+        "enumerate-names X --properties A",
+        "get",
+        "get 'root:C.K=unquoted'",
+        "invoke 'root:C.K=1'",
+        "invoke 'root:C.K=1' 'Bad Method'",
+        "clear-log now",
+        "--namespace",
+        "--library",
+        "--library a --library b clear-log",
+        "--config /nonexistent/platform.conf clear-log",
+    };
+    for (const char* args : bad)
+    {
+        const CommandRun r = run(args);
+        EXPECT_EQ(r.exitCode, 2) << args << "\n" << r.output;
+        EXPECT_NE(r.output.find("usage: selprov"), std::string::npos) << args;
+    }
+}
+
+TEST_F(SelprovCommand, LoadFailuresExitThree)
+{
+    CommandRun r =
+        run("--library /nonexistent/libSELProvider.so enumerate-names X");
+    EXPECT_EQ(r.exitCode, 3);
+    EXPECT_NE(r.output.find("/nonexistent/libSELProvider.so"),
+              std::string::npos);
+    r = run("--library libm.so.6 clear-log");
+    EXPECT_EQ(r.exitCode, 3);
+    EXPECT_NE(r.output.find("SELProvider_Create_InstanceMI"),
+              std::string::npos);
+}
+
+} // namespace
+} // namespace hosttest

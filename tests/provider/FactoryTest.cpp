@@ -1,0 +1,157 @@
+#include "Broker.h"
+#include "SELObjectFactory.h"
+#include "TestSupport.h"
+
+#include <gtest/gtest.h>
+
+#include <vector>
+
+namespace
+{
+
+using host::BrokerCall;
+using host::FaultMode;
+using testsupport::PlatformTest;
+
+host::ObjectPath classPath(const std::string& className)
+{
+    host::ObjectPath path;
+    path.nameSpace = "root/zanqx";
+    path.className = className;
+    return path;
+}
+
+QX::NodeTreeBuilder selTree(unsigned entries)
+{
+    return testsupport::standardTree(entries);
+}
+
+// The builders below the operations, driven directly with the host's broker.
+class Builders : public PlatformTest
+{
+  protected:
+    host::Broker& broker()
+    {
+        return broker_;
+    }
+    host::Broker broker_;
+
+    host::Instance build(const char* className, const char** properties,
+                         bool keysOnly, CMPIStatus* status = nullptr)
+    {
+        QX::SELComposite::SELObjectFactory factory(className);
+        host::Broker::Request request(broker());
+        std::vector<CMPIInstance*> instances;
+        CMPIStatus local{CMPI_RC_OK, nullptr};
+        const unsigned rc = factory.getAllSELCMPIInstances(
+            broker().cmpi(), request.context(),
+            broker().makeObjectPath(classPath(className)), className,
+            properties, keysOnly, instances, status ? status : &local);
+        EXPECT_EQ(rc, 0u);
+        EXPECT_EQ(instances.size(), 1u);
+        host::Instance copy;
+        if (instances.size() == 1 && instances[0] != nullptr)
+        {
+            copy = host::Broker::toInstance(instances[0]);
+        }
+        request.finish(local);
+        return copy;
+    }
+};
+
+TEST_F(Builders, KeysOnlyLogCarriesItsTwoKeys)
+{
+    install(selTree(1));
+    const auto log = build("ZAN_MgmtHwLog", nullptr, true);
+    EXPECT_EQ(log.propertyNames(),
+              (std::vector<std::string>{"Name", "CreationClassName"}));
+}
+
+TEST_F(Builders, KeysOnlyEntryCarriesOnlyItsClassName)
+{
+    install(selTree(1));
+    const auto entry = build("ZAN_MgmtHwLogEntry", nullptr, true);
+    EXPECT_EQ(entry.propertyNames(),
+              std::vector<std::string>{"CreationClassName"});
+}
+
+TEST_F(Builders, KeysOnlyWithAListSetsTheListedProperties)
+{
+    install(selTree(1));
+    const char* list[] = {"Caption", nullptr};
+    const auto log = build("ZAN_MgmtHwLog", list, true);
+    EXPECT_EQ(log.propertyNames(),
+              (std::vector<std::string>{"Name", "CreationClassName",
+                                        "Caption"}));
+}
+
+TEST_F(Builders, NamespaceReadsReportIntoTheCallersStatus)
+{
+    install(selTree(1));
+    broker().faults().fail(BrokerCall::GetCharPtr, FaultMode::FailStatus, 0,
+                           0);
+    CMPIStatus status{CMPI_RC_OK, nullptr};
+    const auto entry = build("ZAN_MgmtHwLogEntry", nullptr, false, &status);
+    EXPECT_EQ(status.rc, CMPI_RC_ERR_FAILED);
+    EXPECT_EQ(entry.propertyNames().size(), 12u);
+}
+
+TEST_F(Builders, FactoryForOneClassAskedForTheOther)
+{
+    install(selTree(2));
+    QX::SELComposite::SELObjectFactory factory("ZAN_MgmtHwLog");
+    EXPECT_EQ(factory.getNumberOfInstances(), 1u);
+    host::Broker::Request request(broker());
+    std::vector<CMPIInstance*> instances;
+    CMPIStatus status{CMPI_RC_OK, nullptr};
+    EXPECT_EQ(factory.getAllSELCMPIInstances(
+                  broker().cmpi(), request.context(),
+                  broker().makeObjectPath(classPath("ZAN_MgmtHwLogEntry")),
+                  "ZAN_MgmtHwLogEntry", nullptr, false, instances, &status),
+              0u);
+    EXPECT_TRUE(instances.empty());
+    EXPECT_EQ(factory.getAllSELCMPIInstances(
+                  broker().cmpi(), request.context(),
+                  broker().makeObjectPath(classPath("ZAN_MgmtHwLog")),
+                  "ZAN_MgmtHwLog", nullptr, false, instances, &status),
+              0u);
+    EXPECT_EQ(instances.size(), 1u);
+    EXPECT_EQ(factory.getAllSELCMPIInstances(
+                  broker().cmpi(), request.context(),
+                  broker().makeObjectPath(classPath("Other")), "Other",
+                  nullptr, false, instances, &status),
+              1u);
+    EXPECT_EQ(instances.size(), 1u) << "appended to, never emptied";
+    EXPECT_EQ(status.rc, CMPI_RC_OK);
+    request.finish(status);
+}
+
+TEST_F(Builders, UnknownClassGathersNothing)
+{
+    install(selTree(2));
+    QX::SELComposite::SELObjectFactory factory("CIM_Nothing");
+    EXPECT_EQ(factory.getNumberOfInstances(), 0u);
+    EXPECT_EQ(factory.executeClearLog(), 0);
+}
+
+TEST_F(Builders, NullPathFromBrokerGivesNullAndLeavesStatusAlone)
+{
+    install(selTree(1));
+    broker().faults().fail(BrokerCall::NewObjectPath, FaultMode::ReturnNull,
+                           0, 0);
+    QX::SELComposite::SELObjectFactory factory("ZAN_MgmtHwLog");
+    host::Broker::Request request(broker());
+    std::vector<CMPIInstance*> instances;
+    CMPIStatus status{CMPI_RC_OK, nullptr};
+    factory.getAllSELCMPIInstances(
+        broker().cmpi(), request.context(),
+        broker().makeObjectPath(classPath("ZAN_MgmtHwLog")), "ZAN_MgmtHwLog",
+        nullptr, false, instances, &status);
+    ASSERT_EQ(instances.size(), 1u);
+    EXPECT_EQ(instances[0], nullptr);
+    EXPECT_EQ(status.rc, CMPI_RC_OK);
+    EXPECT_EQ(broker().faults().calls(BrokerCall::NewInstance), 0u);
+    request.finish(status);
+}
+
+} // namespace
