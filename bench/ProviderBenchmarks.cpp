@@ -9,9 +9,9 @@
 #include "Platform.h"
 #include "SEL.h"
 
-#include <benchmark/benchmark.h>
-
 #include <sstream>
+
+#include <benchmark/benchmark.h>
 
 namespace
 {

@@ -12,7 +12,8 @@ class ProviderException : public std::exception
   public:
     explicit ProviderException(const char* text) :
         message(text != nullptr ? text : "")
-    {}
+    {
+    }
     ProviderException(const ProviderException&) = default;
     ProviderException& operator=(const ProviderException&) = default;
     ~ProviderException() override = default;

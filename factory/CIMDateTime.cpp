@@ -75,27 +75,23 @@ std::string formatCIMDateTime(const DateTime& value, std::size_t scratchSize)
 {
     FieldPrinter printer(scratchSize);
     std::string result;
-    result += printer.unsignedField(
-        static_cast<std::uint16_t>(value.getYear()));
-    appendPadded(result,
-                 printer.unsignedField(
-                     static_cast<std::uint8_t>(value.getMonth())),
-                 2);
-    appendPadded(result,
-                 printer.unsignedField(static_cast<std::uint8_t>(value.getDay())),
-                 2);
-    appendPadded(result,
-                 printer.unsignedField(
-                     static_cast<std::uint8_t>(value.getHour())),
-                 2);
-    appendPadded(result,
-                 printer.unsignedField(
-                     static_cast<std::uint8_t>(value.getMinute())),
-                 2);
-    appendPadded(result,
-                 printer.unsignedField(
-                     static_cast<std::uint8_t>(value.getSecond())),
-                 2);
+    result +=
+        printer.unsignedField(static_cast<std::uint16_t>(value.getYear()));
+    appendPadded(
+        result,
+        printer.unsignedField(static_cast<std::uint8_t>(value.getMonth())), 2);
+    appendPadded(
+        result,
+        printer.unsignedField(static_cast<std::uint8_t>(value.getDay())), 2);
+    appendPadded(
+        result,
+        printer.unsignedField(static_cast<std::uint8_t>(value.getHour())), 2);
+    appendPadded(
+        result,
+        printer.unsignedField(static_cast<std::uint8_t>(value.getMinute())), 2);
+    appendPadded(
+        result,
+        printer.unsignedField(static_cast<std::uint8_t>(value.getSecond())), 2);
     result += ".";
     appendPadded(result, printer.unsignedField(value.getMillisecond()), 6);
     const int offsetMinutes =

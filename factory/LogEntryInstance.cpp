@@ -12,9 +12,9 @@ namespace
 
 constexpr const char* unitFile = "SELObjectFactory.cpp";
 
-const char* logEntryKeys[] = {"RecordID", "CreationClassName",
-                              "LogCreationClassName", "MessageTimestamp",
-                              "LogName", nullptr};
+const char* logEntryKeys[] = {
+    "RecordID",         "CreationClassName", "LogCreationClassName",
+    "MessageTimestamp", "LogName",           nullptr};
 
 } // namespace
 
@@ -34,8 +34,7 @@ CMPIInstance* SELObjectFactory::makeMgmtHwLogEntryInstance(
         CMPIInstance* instance = frame.instance;
         if (!keysOnly)
         {
-            instance->ft->setPropertyFilter(instance, properties,
-                                            logEntryKeys);
+            instance->ft->setPropertyFilter(instance, properties, logEntryKeys);
         }
         setTextProperty(instance, "CreationClassName", LOG_ENTRY_CLASS_NAME);
         if (selection.wants("Caption"))

@@ -39,8 +39,7 @@ SELObjectFactory::SELObjectFactory(const char* className)
     {
         if (getMgmtHwLogEntryInstances(entryRecords) == 0)
         {
-            numberOfInstances =
-                static_cast<std::uint32_t>(entryRecords.size());
+            numberOfInstances = static_cast<std::uint32_t>(entryRecords.size());
         }
     }
     traceEdge(function, __LINE__, EXIT_TRACE);

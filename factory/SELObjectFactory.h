@@ -57,15 +57,13 @@ class SELObjectFactory
 
     CMPIInstance* makeMgmtHwLogInstance(const CMPIBroker* broker,
                                         const CMPIObjectPath* objectPath,
-                                        MgmtHwLog log,
-                                        const char** properties,
+                                        MgmtHwLog log, const char** properties,
                                         bool keysOnly, CMPIStatus* status);
     CMPIInstance* makeMgmtHwLogEntryInstance(const CMPIBroker* broker,
                                              const CMPIObjectPath* objectPath,
                                              MgmtHwLogEntry entry,
                                              const char** properties,
-                                             bool keysOnly,
-                                             CMPIStatus* status);
+                                             bool keysOnly, CMPIStatus* status);
 
     std::string convertCIMDateTime(DateTime value);
     std::string addZero(unsigned char count);

@@ -100,17 +100,17 @@ int getMgmtHwLogInstances(LogMap& logs)
                     if (logCursor.getProperty(NodeLexicon::OverwritePolicy,
                                               policy))
                     {
-                        log.overwritePolicy = policy < OVERWRITE_POLICY_MAP.size()
-                                                  ? OVERWRITE_POLICY_MAP[policy]
-                                                  : 0;
+                        log.overwritePolicy =
+                            policy < OVERWRITE_POLICY_MAP.size()
+                                ? OVERWRITE_POLICY_MAP[policy]
+                                : 0;
                     }
                     const unsigned nodeStatus = logCursor.getNodeStatus();
                     const bool known = nodeStatus < ENABLED_STATE_MAP.size();
                     log.enabledState = known ? ENABLED_STATE_MAP[nodeStatus]
                                              : enabledStateOther;
-                    log.requestedState = known
-                                             ? REQUESTED_STATE_MAP[nodeStatus]
-                                             : requestedStateOther;
+                    log.requestedState = known ? REQUESTED_STATE_MAP[nodeStatus]
+                                               : requestedStateOther;
                     if (!log.setNode(ordinal))
                     {
                         throw ProviderException(

@@ -81,8 +81,7 @@ class MemorySource : public InstrumentationSource
     /** Path of the entry with @p recordId under the log at @p logPath:
      *  the log path, "/entry-" and the record id in five digits, so that
      *  entry paths sort as byte strings in record order. */
-    static std::string entryPath(const std::string& logPath,
-                                 unsigned recordId);
+    static std::string entryPath(const std::string& logPath, unsigned recordId);
 
   private:
     struct Monitor

@@ -15,16 +15,16 @@ enum NodeType : unsigned
 /** Node properties. Each has one value type: text, unsigned or boolean. */
 enum Properties : unsigned
 {
-    MaxRecords = 37,      // unsigned, EventLog
-    Timestamp = 79,       // text, EventLogEntry: "YYYY-MM-DD hh:mm:ss"
-    RecordData = 81,      // text, EventLogEntry
-    DataFormat = 84,      // text, EventLog
-    RecordId = 89,        // unsigned, EventLogEntry
-    Name = 108,           // text, EventLog
+    MaxRecords = 37,       // unsigned, EventLog
+    Timestamp = 79,        // text, EventLogEntry: "YYYY-MM-DD hh:mm:ss"
+    RecordData = 81,       // text, EventLogEntry
+    DataFormat = 84,       // text, EventLog
+    RecordId = 89,         // unsigned, EventLogEntry
+    Name = 108,            // text, EventLog
     OverwritePolicy = 114, // unsigned 0..2, EventLog
-    RestartCause = 166,   // unsigned, Watchdog: 4 = watchdog expiry
-    IsEmpty = 167,        // boolean, EventLog
-    Command = 191,        // unsigned, written to ManagementController
+    RestartCause = 166,    // unsigned, Watchdog: 4 = watchdog expiry
+    IsEmpty = 167,         // boolean, EventLog
+    Command = 191,         // unsigned, written to ManagementController
 };
 
 /** Path relations usable as cursor filters. */

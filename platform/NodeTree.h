@@ -20,10 +20,10 @@ using PropertyValue = std::variant<std::string, unsigned, bool>;
 struct NodeRecord
 {
     NodeLexicon::NodeType kind{};
-    std::string path;        // identity of the node within its tree
+    std::string path; // identity of the node within its tree
     std::string description;
     unsigned status = 0;
-    std::uint32_t parent;    // index of the parent node, or NodeTree::none
+    std::uint32_t parent; // index of the parent node, or NodeTree::none
     std::vector<std::pair<NodeLexicon::Properties, PropertyValue>> properties;
 
     const PropertyValue* find(NodeLexicon::Properties property) const;
@@ -101,8 +101,7 @@ class NodeTreeBuilder
     NodeTreeBuilder& addNode(NodeLexicon::NodeType kind,
                              const std::string& path,
                              const std::string& parentPath,
-                             const std::string& description,
-                             unsigned status);
+                             const std::string& description, unsigned status);
     /** Sets (or replaces) a property of the node at @p path. */
     NodeTreeBuilder& setProperty(const std::string& path,
                                  NodeLexicon::Properties property,

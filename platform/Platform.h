@@ -35,7 +35,7 @@ struct Configuration
  * std::runtime_error naming the line.
  */
 Configuration parseConfiguration(const std::string& text,
-                                  const std::string& sourceName);
+                                 const std::string& sourceName);
 /** Reads the file named by QX_PLATFORM_CONFIG, else the default path; a
  *  missing file gives the defaults. */
 Configuration loadConfiguration();

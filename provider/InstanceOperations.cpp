@@ -62,7 +62,8 @@ CMPIStatus SEL_EnumInstanceNames(CMPIInstanceMI*, const CMPIContext* context,
     logVariable(function, unitFile, __LINE__, loggerSELProvider, "classname",
                 className);
     std::vector<CMPIInstance*> instances;
-    instances.reserve(static_cast<std::uint16_t>(factory.getNumberOfInstances()));
+    instances.reserve(
+        static_cast<std::uint16_t>(factory.getNumberOfInstances()));
     if (factory.getAllSELCMPIInstances(broker.load(), context, reference,
                                        className, nullptr, false, instances,
                                        &status) != 0)
@@ -108,7 +109,8 @@ CMPIStatus SEL_EnumInstances(CMPIInstanceMI*, const CMPIContext* context,
                 className);
     SELObjectFactory factory(className);
     std::vector<CMPIInstance*> instances;
-    instances.reserve(static_cast<std::uint16_t>(factory.getNumberOfInstances()));
+    instances.reserve(
+        static_cast<std::uint16_t>(factory.getNumberOfInstances()));
     if (factory.getAllSELCMPIInstances(broker.load(), context, reference,
                                        className, properties, false, instances,
                                        &status) != 0)
@@ -158,7 +160,8 @@ CMPIStatus SEL_GetInstance(CMPIInstanceMI*, const CMPIContext* context,
                 className);
     SELObjectFactory factory(className);
     std::vector<CMPIInstance*> instances;
-    instances.reserve(static_cast<std::uint16_t>(factory.getNumberOfInstances()));
+    instances.reserve(
+        static_cast<std::uint16_t>(factory.getNumberOfInstances()));
     if (factory.getAllSELCMPIInstances(currentBroker, context, objectPath,
                                        className, properties, false, instances,
                                        &status) != 0)

@@ -29,8 +29,8 @@ CMPIStatus SEL_InvokeMethod(CMPIMethodMI*, const CMPIContext*,
     constexpr const char* function = "SEL_InvokeMethod";
     markProviderEntry(loggerSELProvider, function, unitFile, __LINE__);
     CMPIStatus status{CMPI_RC_OK, nullptr};
-    const char* className = charsOf(
-        objectPath->ft->getClassName(objectPath, &status), &status);
+    const char* className =
+        charsOf(objectPath->ft->getClassName(objectPath, &status), &status);
     if (equalIgnoringCase(className, LOG_CLASS_NAME) &&
         equalIgnoringCase(method, "ClearLog"))
     {

@@ -55,9 +55,8 @@ CMPIStatus SEL_DeleteInstance(CMPIInstanceMI*, const CMPIContext*,
     return statusOf(CMPI_RC_ERR_NOT_SUPPORTED);
 }
 
-CMPIStatus SEL_ExecQuery(CMPIInstanceMI*, const CMPIContext*,
-                         const CMPIResult*, const CMPIObjectPath*,
-                         const char*, const char*)
+CMPIStatus SEL_ExecQuery(CMPIInstanceMI*, const CMPIContext*, const CMPIResult*,
+                         const CMPIObjectPath*, const char*, const char*)
 {
     return statusOf(CMPI_RC_ERR_NOT_SUPPORTED);
 }
@@ -136,25 +135,26 @@ CMPIIndicationMI indicationMI = {nullptr, &indMIFT__};
 extern "C"
 {
 
-CMPIInstanceMI* SELProvider_Create_InstanceMI(const CMPIBroker* broker,
-                                              const CMPIContext*, CMPIStatus*)
-{
-    QX::SELComposite::broker.store(broker);
-    return &QX::SELComposite::instanceMI;
-}
-
-CMPIMethodMI* SELProvider_Create_MethodMI(const CMPIBroker* broker,
-                                          const CMPIContext*, CMPIStatus*)
-{
-    QX::SELComposite::broker.store(broker);
-    return &QX::SELComposite::methodMI;
-}
-
-CMPIIndicationMI* SELProvider_Create_IndicationMI(const CMPIBroker* broker,
+    CMPIInstanceMI* SELProvider_Create_InstanceMI(const CMPIBroker* broker,
                                                   const CMPIContext*,
                                                   CMPIStatus*)
-{
-    QX::SELComposite::broker.store(broker);
-    return &QX::SELComposite::indicationMI;
-}
+    {
+        QX::SELComposite::broker.store(broker);
+        return &QX::SELComposite::instanceMI;
+    }
+
+    CMPIMethodMI* SELProvider_Create_MethodMI(const CMPIBroker* broker,
+                                              const CMPIContext*, CMPIStatus*)
+    {
+        QX::SELComposite::broker.store(broker);
+        return &QX::SELComposite::methodMI;
+    }
+
+    CMPIIndicationMI* SELProvider_Create_IndicationMI(const CMPIBroker* broker,
+                                                      const CMPIContext*,
+                                                      CMPIStatus*)
+    {
+        QX::SELComposite::broker.store(broker);
+        return &QX::SELComposite::indicationMI;
+    }
 }

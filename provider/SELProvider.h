@@ -18,8 +18,7 @@ extern std::string loggerSELProvider;
 
 CMPIStatus SEL_Cleanup(CMPIInstanceMI* mi, const CMPIContext* context,
                        CMPIBoolean terminating);
-CMPIStatus SEL_EnumInstanceNames(CMPIInstanceMI* mi,
-                                 const CMPIContext* context,
+CMPIStatus SEL_EnumInstanceNames(CMPIInstanceMI* mi, const CMPIContext* context,
                                  const CMPIResult* result,
                                  const CMPIObjectPath* reference);
 CMPIStatus SEL_EnumInstances(CMPIInstanceMI* mi, const CMPIContext* context,
@@ -58,8 +57,7 @@ CMPIStatus SEL_InvokeMethod(CMPIMethodMI* mi, const CMPIContext* context,
 CMPIStatus SEL_IndicationCleanup(CMPIIndicationMI* mi,
                                  const CMPIContext* context,
                                  CMPIBoolean terminating);
-CMPIStatus SEL_AuthorizeFilter(CMPIIndicationMI* mi,
-                               const CMPIContext* context,
+CMPIStatus SEL_AuthorizeFilter(CMPIIndicationMI* mi, const CMPIContext* context,
                                const CMPISelectExp* filter,
                                const char* className,
                                const CMPIObjectPath* objectPath,
@@ -67,8 +65,7 @@ CMPIStatus SEL_AuthorizeFilter(CMPIIndicationMI* mi,
 CMPIStatus SEL_MustPoll(CMPIIndicationMI* mi, const CMPIContext* context,
                         const CMPISelectExp* filter, const char* className,
                         const CMPIObjectPath* objectPath);
-CMPIStatus SEL_ActivateFilter(CMPIIndicationMI* mi,
-                              const CMPIContext* context,
+CMPIStatus SEL_ActivateFilter(CMPIIndicationMI* mi, const CMPIContext* context,
                               const CMPISelectExp* filter,
                               const char* className,
                               const CMPIObjectPath* objectPath,
@@ -93,13 +90,15 @@ extern CMPIIndicationMIFT indMIFT__;
 
 extern "C"
 {
-CMPI_EXPORT CMPIInstanceMI*
-SELProvider_Create_InstanceMI(const CMPIBroker* broker,
-                              const CMPIContext* context, CMPIStatus* status);
-CMPI_EXPORT CMPIMethodMI* SELProvider_Create_MethodMI(
-    const CMPIBroker* broker, const CMPIContext* context, CMPIStatus* status);
-CMPI_EXPORT CMPIIndicationMI*
-SELProvider_Create_IndicationMI(const CMPIBroker* broker,
-                                const CMPIContext* context,
-                                CMPIStatus* status);
+    CMPI_EXPORT CMPIInstanceMI*
+    SELProvider_Create_InstanceMI(const CMPIBroker* broker,
+                                  const CMPIContext* context,
+                                  CMPIStatus* status);
+    CMPI_EXPORT CMPIMethodMI*
+    SELProvider_Create_MethodMI(const CMPIBroker* broker,
+                                const CMPIContext* context, CMPIStatus* status);
+    CMPI_EXPORT CMPIIndicationMI*
+    SELProvider_Create_IndicationMI(const CMPIBroker* broker,
+                                    const CMPIContext* context,
+                                    CMPIStatus* status);
 }

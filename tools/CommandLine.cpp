@@ -76,6 +76,11 @@ class Reader
         return std::nullopt;
     }
 
+    std::size_t position() const
+    {
+        return pos_;
+    }
+
   private:
     const std::vector<std::string>& args_;
     std::size_t pos_ = 0;
@@ -103,6 +108,8 @@ const char* usageText()
            "  get OBJECTPATH [--properties P1,P2]\n"
            "  clear-log\n"
            "  invoke OBJECTPATH METHOD\n"
+           "  batch             (commands from standard input, one a line, "
+           "in one process)\n"
            "  help\n"
            "OBJECTPATH is WBEM text, e.g. "
            "'root/zanqx:ZAN_MgmtHwLog.CreationClassName=\"ZAN_MgmtHwLog\","
@@ -148,6 +155,9 @@ Options parseCommandLine(const std::vector<std::string>& args)
             throw UsageError("unknown option " + in.peek());
         }
     }
+    o.globalArgs.assign(args.begin(),
+                        args.begin() +
+                            static_cast<std::ptrdiff_t>(in.position()));
     if (o.library && o.library->empty())
     {
         throw UsageError("--library needs a path");
@@ -197,6 +207,10 @@ Options parseCommandLine(const std::vector<std::string>& args)
             throw UsageError("bad method name \"" + o.method + "\"");
         }
     }
+    else if (command == "batch")
+    {
+        o.command = Command::Batch;
+    }
     else if (command == "help")
     {
         o.command = Command::Help;
@@ -222,6 +236,47 @@ Options parseCommandLine(const std::vector<std::string>& args)
         }
     }
     return o;
+}
+
+std::vector<std::string> splitBatchLine(const std::string& line)
+{
+    std::vector<std::string> words;
+    std::string word;
+    bool inWord = false;
+    bool quoted = false;
+    for (std::size_t i = 0; i < line.size(); ++i)
+    {
+        const char c = line[i];
+        if (!quoted && (c == ' ' || c == '\t' || c == '\r'))
+        {
+            if (inWord)
+            {
+                words.push_back(std::move(word));
+                word.clear();
+                inWord = false;
+            }
+            continue;
+        }
+        inWord = true;
+        word += c;
+        if (quoted && c == '\\' && i + 1 < line.size())
+        {
+            word += line[++i];
+        }
+        else if (c == '"')
+        {
+            quoted = !quoted;
+        }
+    }
+    if (quoted)
+    {
+        throw UsageError("unterminated quote in \"" + line + "\"");
+    }
+    if (inWord)
+    {
+        words.push_back(std::move(word));
+    }
+    return words;
 }
 
 } // namespace selprov

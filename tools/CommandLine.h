@@ -22,6 +22,7 @@ enum class Command
     Get,
     ClearLog,
     Invoke,
+    Batch,
     Help,
 };
 
@@ -35,10 +36,18 @@ struct Options
     std::string target; // class name or object path
     std::string method; // invoke
     std::optional<std::vector<std::string>> properties;
+    // The options given before the command, as typed; a batch applies them
+    // to each of its lines.
+    std::vector<std::string> globalArgs;
 };
 
 // Throws UsageError on anything malformed.
 Options parseCommandLine(const std::vector<std::string>& args);
 const char* usageText();
+
+// Splits one line of a batch into words at blanks outside double quotes;
+// quotes and backslash escapes stay in the word (object paths need them).
+// Throws UsageError for an unterminated quote.
+std::vector<std::string> splitBatchLine(const std::string& line);
 
 } // namespace selprov

@@ -6,8 +6,12 @@ set -euo pipefail
 cd "$(dirname "$0")/.."
 
 tools/setup-deps.sh
-cmake --preset default >/dev/null
-cmake --build --preset default --target SELProvider selprov
+mkdir -p build
+if ! { cmake --preset default && cmake --build --preset default --target SELProvider selprov; } \
+        >build/main-job-build.log 2>&1; then
+    cat build/main-job-build.log
+    exit 1
+fi
 
 selprov=build/bin/selprov
 run() {

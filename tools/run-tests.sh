@@ -7,7 +7,7 @@ cd "$(dirname "$0")/.."
 tools/setup-deps.sh
 
 echo "== format check"
-git ls-files -- '*.h' '*.cpp' | grep -v '^include/' |
+git ls-files -- '*.h' '*.cpp' |
     xargs clang-format --dry-run --Werror
 
 for preset in default asan tsan; do

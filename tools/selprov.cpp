@@ -162,10 +162,64 @@ host::Outcome run(const selprov::Options& o, host::Host& h)
                 printReturnValue(o, out);
             }
             break;
+        case Command::Batch:
         case Command::Help:
             break;
     }
     return out;
+}
+
+int report(const host::Outcome& out)
+{
+    if (out.rc != CMPI_RC_OK)
+    {
+        std::cerr << "selprov: " << host::describeStatus(out.rc, out.message)
+                  << "\n";
+        return exitFailed;
+    }
+    std::cout.flush();
+    return std::cout ? 0 : exitFailed;
+}
+
+// Runs one command a line from standard input on the one loaded provider,
+// so that later commands see what earlier ones changed. Every line runs;
+// the exit code is that of the first line that failed.
+int runBatch(const selprov::Options& batch, host::Host& h)
+{
+    int result = 0;
+    std::string line;
+    while (std::getline(std::cin, line))
+    {
+        int code = 0;
+        try
+        {
+            std::vector<std::string> args = batch.globalArgs;
+            const std::vector<std::string> words =
+                selprov::splitBatchLine(line);
+            if (words.empty() || words.front().rfind("#", 0) == 0)
+            {
+                continue;
+            }
+            args.insert(args.end(), words.begin(), words.end());
+            const selprov::Options options = selprov::parseCommandLine(args);
+            if (options.command == selprov::Command::Batch ||
+                options.command == selprov::Command::Help)
+            {
+                throw selprov::UsageError("not a request: \"" + line + "\"");
+            }
+            code = report(run(options, h));
+        }
+        catch (const selprov::UsageError& e)
+        {
+            std::cerr << "selprov: " << e.what() << "\n";
+            code = exitUsage;
+        }
+        if (result == 0)
+        {
+            result = code;
+        }
+    }
+    return result;
 }
 
 } // namespace
@@ -207,15 +261,11 @@ int main(int argc, char** argv)
     try
     {
         host::Host h(options.library.value_or(defaultLibrary()));
-        const host::Outcome out = run(options, h);
-        if (out.rc != CMPI_RC_OK)
+        if (options.command == selprov::Command::Batch)
         {
-            std::cerr << "selprov: "
-                      << host::describeStatus(out.rc, out.message) << "\n";
-            return exitFailed;
+            return runBatch(options, h);
         }
-        std::cout.flush();
-        return std::cout ? 0 : exitFailed;
+        return report(run(options, h));
     }
     catch (const host::LoadError& e)
     {

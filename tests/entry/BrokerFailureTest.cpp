@@ -18,8 +18,8 @@ class BrokerFailures : public ProviderTest
 TEST_F(BrokerFailures, NullObjectPathYieldsANullInstance)
 {
     install(selTree(3));
-    broker().faults().fail(BrokerCall::NewObjectPath, FaultMode::ReturnNull,
-                           1, 1);
+    broker().faults().fail(BrokerCall::NewObjectPath, FaultMode::ReturnNull, 1,
+                           1);
     const auto names =
         host().enumerateInstanceNames(classPath("ZAN_MgmtHwLogEntry"));
     EXPECT_EQ(names.rc, CMPI_RC_OK);
@@ -65,8 +65,7 @@ TEST_F(BrokerFailures, FailedStringLeavesAPartlyFilledArray)
 {
     install(selTree(1));
     // The second description's string cannot be made.
-    broker().faults().fail(BrokerCall::NewString, FaultMode::ReturnNull, 1,
-                           1);
+    broker().faults().fail(BrokerCall::NewString, FaultMode::ReturnNull, 1, 1);
     const auto outcome = host().enumerateInstances(classPath("ZAN_MgmtHwLog"));
     ASSERT_EQ(outcome.instances.size(), 1u);
     const host::Value* descriptions =
@@ -119,8 +118,7 @@ TEST_F(BrokerFailures, ClassNameStatusFailureKeepsTheCharacters)
 TEST_F(BrokerFailures, FailedMessageStringLeavesTheMessageNull)
 {
     install(selTree(1));
-    broker().faults().fail(BrokerCall::NewString, FaultMode::ReturnNull, 0,
-                           1);
+    broker().faults().fail(BrokerCall::NewString, FaultMode::ReturnNull, 0, 1);
     const auto outcome = host().getInstance(classPath("ZAN_MgmtHwLog"));
     EXPECT_EQ(outcome.rc, CMPI_RC_ERR_FAILED);
     EXPECT_FALSE(outcome.message.has_value());

@@ -5,11 +5,11 @@
 #include "NodeTree.h"
 #include "Platform.h"
 
-#include <gtest/gtest.h>
-
 #include <memory>
 #include <string>
 #include <vector>
+
+#include <gtest/gtest.h>
 
 namespace entry
 {

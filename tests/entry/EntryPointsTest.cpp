@@ -1,9 +1,9 @@
 #include "EntryFixture.h"
 #include "ProviderLibrary.h"
 
-#include <gtest/gtest.h>
-
 #include <cstring>
+
+#include <gtest/gtest.h>
 
 namespace
 {
@@ -49,8 +49,7 @@ TEST(FactoryTest, NullContextAndStatusAreAccepted)
     host::Broker broker;
     EXPECT_NE(library.createInstanceMI(broker.cmpi(), nullptr, nullptr),
               nullptr);
-    EXPECT_NE(library.createMethodMI(broker.cmpi(), nullptr, nullptr),
-              nullptr);
+    EXPECT_NE(library.createMethodMI(broker.cmpi(), nullptr, nullptr), nullptr);
     EXPECT_NE(library.createIndicationMI(broker.cmpi(), nullptr, nullptr),
               nullptr);
 }
@@ -73,8 +72,8 @@ TEST(FactoryTest, TheLastBrokerPassedIsTheOneOperationsUse)
     host::ProviderLibrary library(SELPROV_LIBRARY, "SELProvider");
     host::Broker first;
     host::Broker last;
-    CMPIInstanceMI* mi = library.createInstanceMI(first.cmpi(), nullptr,
-                                                  nullptr);
+    CMPIInstanceMI* mi =
+        library.createInstanceMI(first.cmpi(), nullptr, nullptr);
     library.createMethodMI(last.cmpi(), nullptr, nullptr);
     // A get without keys writes to the trace of the broker the provider
     // holds, whichever broker made the request's objects.
@@ -139,9 +138,9 @@ TEST_F(FixedOperations, WritesAreNotSupported)
     expectNotSupported(host().createInstance(path, instance));
     expectNotSupported(host().modifyInstance(path, instance));
     expectNotSupported(host().deleteInstance(path));
-    expectNotSupported(host().execQuery(
-        classPath("ZAN_MgmtHwLogEntry"),
-        "SELECT * FROM ZAN_MgmtHwLogEntry", "WQL"));
+    expectNotSupported(host().execQuery(classPath("ZAN_MgmtHwLogEntry"),
+                                        "SELECT * FROM ZAN_MgmtHwLogEntry",
+                                        "WQL"));
     EXPECT_EQ(source->acceptedWrites(), 0u);
 }
 
@@ -163,8 +162,7 @@ TEST_F(FixedOperations, FiltersAreAuthorisedAndNeverPolled)
     }
     const CMPIStatus owned = mi->ft->authorizeFilter(
         mi, request.context(), nullptr, "ZAN_MgmtHwLogFullEvent",
-        broker().makeObjectPath(classPath("ZAN_MgmtHwLogFullEvent")),
-        "root");
+        broker().makeObjectPath(classPath("ZAN_MgmtHwLogFullEvent")), "root");
     EXPECT_EQ(owned.rc, CMPI_RC_OK);
     request.finish(owned);
 }

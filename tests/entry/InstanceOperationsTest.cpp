@@ -1,9 +1,9 @@
 #include "EntryFixture.h"
 #include "Support.h"
 
-#include <gtest/gtest.h>
-
 #include <algorithm>
+
+#include <gtest/gtest.h>
 
 namespace
 {
@@ -34,18 +34,30 @@ std::vector<std::string> sorted(std::vector<std::string> names)
 TEST_F(InstanceOperations, EnumerateLogInstanceWithEveryProperty)
 {
     install(selTree(3));
-    const auto outcome =
-        host().enumerateInstances(classPath("ZAN_MgmtHwLog"));
+    const auto outcome = host().enumerateInstances(classPath("ZAN_MgmtHwLog"));
     ASSERT_EQ(outcome.rc, CMPI_RC_OK);
     EXPECT_TRUE(outcome.done);
     ASSERT_EQ(outcome.instances.size(), 1u);
     const host::Instance& log = outcome.instances[0];
-    const std::vector<std::string> expectedOrder = {
-        "Name", "CreationClassName", "Caption", "Description", "ElementName",
-        "Status", "Node", "MaxNumberOfRecords", "CurrentNumberOfRecords",
-        "OverWritePolicy", "EnabledState", "RequestedState", "CharacterSet",
-        "MaxLogSize", "PercentageNearFull", "IsFrozen", "OperationalStatus",
-        "Capabilities", "StatusDescriptions"};
+    const std::vector<std::string> expectedOrder = {"Name",
+                                                    "CreationClassName",
+                                                    "Caption",
+                                                    "Description",
+                                                    "ElementName",
+                                                    "Status",
+                                                    "Node",
+                                                    "MaxNumberOfRecords",
+                                                    "CurrentNumberOfRecords",
+                                                    "OverWritePolicy",
+                                                    "EnabledState",
+                                                    "RequestedState",
+                                                    "CharacterSet",
+                                                    "MaxLogSize",
+                                                    "PercentageNearFull",
+                                                    "IsFrozen",
+                                                    "OperationalStatus",
+                                                    "Capabilities",
+                                                    "StatusDescriptions"};
     EXPECT_EQ(log.propertyNames(), expectedOrder);
     EXPECT_EQ(log.property("Name")->text, "IPMI SEL Log");
     EXPECT_EQ(log.property("CreationClassName")->text, "ZAN_MgmtHwLog");
@@ -108,13 +120,11 @@ TEST_F(InstanceOperations, EntryInstancesInKeyOrderWithTheirProperties)
     EXPECT_EQ(second.property("RecordID")->text, "10");
     EXPECT_EQ(first.property("Node")->u, 2u) << "walk ordinal";
     const std::vector<std::string> expectedOrder = {
-        "CreationClassName", "Caption",    "Description",
-        "ElementName",       "LogCreationClassName", "LogName",
-        "RecordID",          "RecordData", "MessageTimestamp",
-        "DataFormat",        "Node",       "Source"};
+        "CreationClassName",    "Caption",    "Description", "ElementName",
+        "LogCreationClassName", "LogName",    "RecordID",    "RecordData",
+        "MessageTimestamp",     "DataFormat", "Node",        "Source"};
     EXPECT_EQ(second.propertyNames(), expectedOrder);
-    EXPECT_EQ(second.property("CreationClassName")->text,
-              "ZAN_MgmtHwLogEntry");
+    EXPECT_EQ(second.property("CreationClassName")->text, "ZAN_MgmtHwLogEntry");
     EXPECT_EQ(second.property("Caption")->text, "IPMI SEL LOG");
     EXPECT_EQ(second.property("Description")->text, "Fan FAN3 low");
     EXPECT_EQ(second.property("ElementName")->text,
@@ -130,8 +140,7 @@ TEST_F(InstanceOperations, EntryInstancesInKeyOrderWithTheirProperties)
     const host::ObjectPath& path = second.path;
     EXPECT_EQ(path.keys.size(), 5u);
     EXPECT_EQ(path.key("RecordID")->text, "10");
-    EXPECT_EQ(path.key("MessageTimestamp")->text,
-              "20080523044811.000000+000");
+    EXPECT_EQ(path.key("MessageTimestamp")->text, "20080523044811.000000+000");
 }
 
 TEST_F(InstanceOperations, RejectedTimestampLeavesOnlyThatPropertyOut)
@@ -165,8 +174,7 @@ TEST_F(InstanceOperations, PropertyListSelectsConditionalProperties)
               sorted({"Name", "CreationClassName"}));
 
     const std::vector<std::string> lowerCase = {"caption"};
-    outcome =
-        host().enumerateInstances(classPath("ZAN_MgmtHwLog"), &lowerCase);
+    outcome = host().enumerateInstances(classPath("ZAN_MgmtHwLog"), &lowerCase);
     EXPECT_EQ(outcome.instances[0].property("Caption"), nullptr);
 }
 
@@ -174,14 +182,14 @@ TEST_F(InstanceOperations, EntryPropertyListIsExact)
 {
     install(selTree(1));
     const std::vector<std::string> recordId = {"RecordID"};
-    auto outcome = host().enumerateInstances(classPath("ZAN_MgmtHwLogEntry"),
-                                             &recordId);
+    auto outcome =
+        host().enumerateInstances(classPath("ZAN_MgmtHwLogEntry"), &recordId);
     ASSERT_EQ(outcome.instances.size(), 1u);
     EXPECT_EQ(sorted(outcome.instances[0].propertyNames()),
               sorted({"CreationClassName", "RecordID"}));
     const std::vector<std::string> lower = {"recordid"};
-    outcome = host().enumerateInstances(classPath("ZAN_MgmtHwLogEntry"),
-                                        &lower);
+    outcome =
+        host().enumerateInstances(classPath("ZAN_MgmtHwLogEntry"), &lower);
     EXPECT_EQ(outcome.instances[0].propertyNames(),
               std::vector<std::string>{"CreationClassName"});
 }
@@ -296,11 +304,13 @@ TEST_F(InstanceOperations, HugeClassNameIsHandledWithoutHarm)
     const auto outcome = host().enumerateInstances(classPath(huge));
     EXPECT_EQ(outcome.rc, CMPI_RC_OK);
     EXPECT_FALSE(outcome.done);
-    const auto names = host().getInstance([&] {
-        host::ObjectPath path = classPath(huge);
-        path.keys.push_back({"Name", host::Value::string(huge)});
-        return path;
-    }());
+    const auto names = host().getInstance(
+        [&]
+        {
+            host::ObjectPath path = classPath(huge);
+            path.keys.push_back({"Name", host::Value::string(huge)});
+            return path;
+        }());
     EXPECT_FALSE(names.done);
 }
 
@@ -348,8 +358,7 @@ TEST_F(InstanceOperations, CountIsTakenModulo65536)
 
     source->replaceTree(selTree(65536).build());
     const std::vector<std::string> none;
-    outcome = host().enumerateInstances(classPath("ZAN_MgmtHwLogEntry"),
-                                        &none);
+    outcome = host().enumerateInstances(classPath("ZAN_MgmtHwLogEntry"), &none);
     EXPECT_TRUE(outcome.done);
     EXPECT_TRUE(outcome.instances.empty());
 }

@@ -1,11 +1,10 @@
 #include "EntryFixture.h"
 #include "ProviderLibrary.h"
 
-#include <gtest/gtest.h>
-
 #include <dlfcn.h>
-
 #include <string>
+
+#include <gtest/gtest.h>
 
 namespace
 {
@@ -58,16 +57,16 @@ TEST_F(Loading, LibraryIsReallyUnloadedBetweenLoads)
         ::dlclose(handle);
     }
     host::Host again(SELPROV_LIBRARY);
-    EXPECT_EQ(again.enumerateInstanceNames(classPath("ZAN_MgmtHwLog"))
-                  .paths.size(),
-              1u);
+    EXPECT_EQ(
+        again.enumerateInstanceNames(classPath("ZAN_MgmtHwLog")).paths.size(),
+        1u);
 }
 
 TEST(LoadingErrors, MissingLibraryIsReported)
 {
-    EXPECT_THROW(host::ProviderLibrary("/nonexistent/libSELProvider.so",
-                                       "SELProvider"),
-                 std::runtime_error);
+    EXPECT_THROW(
+        host::ProviderLibrary("/nonexistent/libSELProvider.so", "SELProvider"),
+        std::runtime_error);
 }
 
 TEST(LoadingErrors, WrongProviderNameFindsNoFactory)

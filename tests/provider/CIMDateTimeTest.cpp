@@ -1,4 +1,5 @@
 #include "CIMDateTime.h"
+
 #include "SELObjectFactory.h"
 
 #include <gtest/gtest.h>
@@ -19,8 +20,8 @@ std::string viaFactory(const DateTime& value)
     return factory.convertCIMDateTime(value);
 }
 
-class BothConversions
-    : public ::testing::TestWithParam<std::string (*)(const DateTime&)>
+class BothConversions :
+    public ::testing::TestWithParam<std::string (*)(const DateTime&)>
 {
   protected:
     std::string convert(const DateTime& value) const
@@ -70,8 +71,8 @@ TEST_P(BothConversions, MillisecondsFillTheFractionAsTheyAre)
 TEST_P(BothConversions, Offsets)
 {
     const std::pair<int, std::string> cases[] = {
-        {0, "+000"},  {1, "+060"},   {10, "+600"},  {17, "+1020"},
-        {-1, "-60"},  {-5, "-300"},  {-12, "-720"},
+        {0, "+000"}, {1, "+060"},  {10, "+600"},  {17, "+1020"},
+        {-1, "-60"}, {-5, "-300"}, {-12, "-720"},
     };
     for (const auto& [hours, text] : cases)
     {

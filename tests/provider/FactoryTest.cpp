@@ -2,9 +2,9 @@
 #include "SELObjectFactory.h"
 #include "TestSupport.h"
 
-#include <gtest/gtest.h>
-
 #include <vector>
+
+#include <gtest/gtest.h>
 
 namespace
 {
@@ -80,16 +80,15 @@ TEST_F(Builders, KeysOnlyWithAListSetsTheListedProperties)
     install(selTree(1));
     const char* list[] = {"Caption", nullptr};
     const auto log = build("ZAN_MgmtHwLog", list, true);
-    EXPECT_EQ(log.propertyNames(),
-              (std::vector<std::string>{"Name", "CreationClassName",
-                                        "Caption"}));
+    EXPECT_EQ(
+        log.propertyNames(),
+        (std::vector<std::string>{"Name", "CreationClassName", "Caption"}));
 }
 
 TEST_F(Builders, NamespaceReadsReportIntoTheCallersStatus)
 {
     install(selTree(1));
-    broker().faults().fail(BrokerCall::GetCharPtr, FaultMode::FailStatus, 0,
-                           0);
+    broker().faults().fail(BrokerCall::GetCharPtr, FaultMode::FailStatus, 0, 0);
     CMPIStatus status{CMPI_RC_OK, nullptr};
     const auto entry = build("ZAN_MgmtHwLogEntry", nullptr, false, &status);
     EXPECT_EQ(status.rc, CMPI_RC_ERR_FAILED);
@@ -118,8 +117,8 @@ TEST_F(Builders, FactoryForOneClassAskedForTheOther)
     EXPECT_EQ(instances.size(), 1u);
     EXPECT_EQ(factory.getAllSELCMPIInstances(
                   broker().cmpi(), request.context(),
-                  broker().makeObjectPath(classPath("Other")), "Other",
-                  nullptr, false, instances, &status),
+                  broker().makeObjectPath(classPath("Other")), "Other", nullptr,
+                  false, instances, &status),
               1u);
     EXPECT_EQ(instances.size(), 1u) << "appended to, never emptied";
     EXPECT_EQ(status.rc, CMPI_RC_OK);
@@ -137,8 +136,8 @@ TEST_F(Builders, UnknownClassGathersNothing)
 TEST_F(Builders, NullPathFromBrokerGivesNullAndLeavesStatusAlone)
 {
     install(selTree(1));
-    broker().faults().fail(BrokerCall::NewObjectPath, FaultMode::ReturnNull,
-                           0, 0);
+    broker().faults().fail(BrokerCall::NewObjectPath, FaultMode::ReturnNull, 0,
+                           0);
     QX::SELComposite::SELObjectFactory factory("ZAN_MgmtHwLog");
     host::Broker::Request request(broker());
     std::vector<CMPIInstance*> instances;

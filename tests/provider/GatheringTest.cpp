@@ -150,10 +150,10 @@ TEST_F(GatheringTest, MissingPropertiesKeepDefaults)
     EXPECT_EQ(logs.at("IPMI SEL Log").maxNumberOfRecords, 0u);
 }
 
-class NodeStatusMapping
-    : public PlatformTest,
-      public ::testing::WithParamInterface<
-          std::tuple<unsigned, std::uint16_t, std::uint16_t>>
+class NodeStatusMapping :
+    public PlatformTest,
+    public ::testing::WithParamInterface<
+        std::tuple<unsigned, std::uint16_t, std::uint16_t>>
 {
 };
 
@@ -171,17 +171,17 @@ TEST_P(NodeStatusMapping, MapsToEnabledAndRequestedState)
 
 INSTANTIATE_TEST_SUITE_P(
     AllStatuses, NodeStatusMapping,
-    ::testing::Values(
-        std::make_tuple(0u, 0, 0), std::make_tuple(1u, 2, 2),
-        std::make_tuple(2u, 10, 12), std::make_tuple(3u, 5, 12),
-        std::make_tuple(4u, 5, 12), std::make_tuple(5u, 5, 12),
-        std::make_tuple(6u, 5, 12), std::make_tuple(7u, 5, 12),
-        std::make_tuple(8u, 5, 12), std::make_tuple(9u, 5, 11),
-        std::make_tuple(10u, 5, 12), std::make_tuple(11u, 5, 12),
-        std::make_tuple(12u, 6, 6), std::make_tuple(13u, 5, 12),
-        std::make_tuple(14u, 5, 12), std::make_tuple(15u, 5, 12),
-        std::make_tuple(16u, 3, 3), std::make_tuple(17u, 5, 12),
-        std::make_tuple(40u, 5, 12), std::make_tuple(4294967295u, 5, 12)));
+    ::testing::Values(std::make_tuple(0u, 0, 0), std::make_tuple(1u, 2, 2),
+                      std::make_tuple(2u, 10, 12), std::make_tuple(3u, 5, 12),
+                      std::make_tuple(4u, 5, 12), std::make_tuple(5u, 5, 12),
+                      std::make_tuple(6u, 5, 12), std::make_tuple(7u, 5, 12),
+                      std::make_tuple(8u, 5, 12), std::make_tuple(9u, 5, 11),
+                      std::make_tuple(10u, 5, 12), std::make_tuple(11u, 5, 12),
+                      std::make_tuple(12u, 6, 6), std::make_tuple(13u, 5, 12),
+                      std::make_tuple(14u, 5, 12), std::make_tuple(15u, 5, 12),
+                      std::make_tuple(16u, 3, 3), std::make_tuple(17u, 5, 12),
+                      std::make_tuple(40u, 5, 12),
+                      std::make_tuple(4294967295u, 5, 12)));
 
 TEST_F(GatheringTest, NoControllerLeavesTheMapsUntouched)
 {
@@ -195,8 +195,7 @@ TEST_F(GatheringTest, NoControllerLeavesTheMapsUntouched)
     EXPECT_EQ(QX::SELComposite::getMgmtHwLogEntryInstances(entries), 1);
     EXPECT_EQ(logs.size(), 1u);
     EXPECT_TRUE(entries.empty());
-    EXPECT_EQ(recordsContaining("EXITING: getMgmtHwLogInstances()").size(),
-              2u);
+    EXPECT_EQ(recordsContaining("EXITING: getMgmtHwLogInstances()").size(), 2u);
     EXPECT_EQ(
         recordsContaining("EXITING: getMgmtHwLogEntryInstances() in SEL.cpp "
                           "[Line: 682]")
@@ -247,9 +246,9 @@ TEST_F(GatheringTest, EntriesCarryTheirFields)
     EXPECT_EQ(entry.recordData,
               "01 00 02 00 00 00 00 20 00 04 01 30 01 59 50 52");
     EXPECT_EQ(entry.messageTimestamp, "20080523044811.000000+000");
-    EXPECT_EQ(entries.at(source->printablePath("/bmc0/sel/entry-00009"))
-                  .getNode(),
-              2);
+    EXPECT_EQ(
+        entries.at(source->printablePath("/bmc0/sel/entry-00009")).getNode(),
+        2);
 }
 
 TEST_F(GatheringTest, EntryWalkTraces)
@@ -302,8 +301,8 @@ TEST_F(GatheringTest, EmptyDescriptionStopsTheEntryWalk)
     EXPECT_EQ(err, "Failed while setting Description\n");
     ASSERT_EQ(entries.size(), 1u);
     EXPECT_EQ(entries.begin()->second.getDescription(), "first");
-    EXPECT_TRUE(recordsContaining("EXITING: getMgmtHwLogEntryInstances()")
-                    .empty())
+    EXPECT_TRUE(
+        recordsContaining("EXITING: getMgmtHwLogEntryInstances()").empty())
         << "an exception skips the exit trace";
 }
 
@@ -311,8 +310,8 @@ TEST_F(GatheringTest, InstrumentationExceptionIsReportedAndStopsTheWalk)
 {
     install(standardTree(5));
     // Each entry reads three properties; fail the fifth read overall.
-    source->armFault({QX::CursorOperation::GetProperty, 4, false,
-                      "BMC stopped answering"});
+    source->armFault(
+        {QX::CursorOperation::GetProperty, 4, false, "BMC stopped answering"});
     EntryMap entries;
     ::testing::internal::CaptureStderr();
     const int status = QX::SELComposite::getMgmtHwLogEntryInstances(entries);
@@ -350,8 +349,8 @@ TEST_F(GatheringTest, ExistingKeysAreReplacedNotKept)
 {
     install(standardTree(1));
     EntryMap entries;
-    const std::string key = source->printablePath(
-        QX::MemorySource::entryPath("/bmc0/sel", 1));
+    const std::string key =
+        source->printablePath(QX::MemorySource::entryPath("/bmc0/sel", 1));
     entries[key].recordID = "stale";
     entries["IPMI:/other"].recordID = "other";
     ASSERT_EQ(QX::SELComposite::getMgmtHwLogEntryInstances(entries), 0);
@@ -395,8 +394,7 @@ TEST_F(GatheringTest, ClearWithoutControllerIsRefused)
 TEST(ConvertUintToString, Extremes)
 {
     EXPECT_EQ(QX::SELComposite::convertUintToString(0), "0");
-    EXPECT_EQ(QX::SELComposite::convertUintToString(4294967295u),
-              "4294967295");
+    EXPECT_EQ(QX::SELComposite::convertUintToString(4294967295u), "4294967295");
     EXPECT_EQ(QX::SELComposite::convertUintToString(100), "100");
 }
 

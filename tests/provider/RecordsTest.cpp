@@ -1,9 +1,9 @@
 #include "MgmtHwLog.h"
 #include "MgmtHwLogEntry.h"
 
-#include <gtest/gtest.h>
-
 #include <thread>
+
+#include <gtest/gtest.h>
 
 namespace
 {
@@ -67,8 +67,7 @@ TEST(MgmtHwLogTest, EnabledLogReportsOk)
     MgmtHwLog log;
     log.enabledState = 2;
     EXPECT_EQ(log.getStatus(), "OK");
-    EXPECT_EQ(log.getOperationalStatus(),
-              (std::vector<std::uint16_t>{2, 11}));
+    EXPECT_EQ(log.getOperationalStatus(), (std::vector<std::uint16_t>{2, 11}));
     EXPECT_EQ(log.getStatusDescriptions(),
               (std::vector<std::string>{"OK", "Service"}));
 }

@@ -65,8 +65,8 @@ std::vector<CVLog::LogRecord> PlatformTest::logRecords() const
     return capture->records();
 }
 
-std::vector<CVLog::LogRecord> PlatformTest::recordsContaining(
-    const std::string& text) const
+std::vector<CVLog::LogRecord>
+PlatformTest::recordsContaining(const std::string& text) const
 {
     std::vector<CVLog::LogRecord> found;
     for (const auto& record : capture->records())

@@ -5,11 +5,11 @@
 #include "NodeTree.h"
 #include "Platform.h"
 
-#include <gtest/gtest.h>
-
 #include <memory>
 #include <string>
 #include <vector>
+
+#include <gtest/gtest.h>
 
 namespace testsupport
 {
@@ -36,8 +36,8 @@ class PlatformTest : public ::testing::Test
     void install(const QX::NodeTreeBuilder& tree);
     std::vector<CVLog::LogRecord> logRecords() const;
     /** Records whose message contains @p text. */
-    std::vector<CVLog::LogRecord> recordsContaining(
-        const std::string& text) const;
+    std::vector<CVLog::LogRecord>
+    recordsContaining(const std::string& text) const;
 
     std::shared_ptr<QX::MemorySource> source;
     std::shared_ptr<CVLog::CaptureSink> capture;

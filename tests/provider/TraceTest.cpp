@@ -1,12 +1,13 @@
-#include "ProviderException.h"
-#include "TestSupport.h"
 #include "sdk/qxlib/include/Trace.h"
 
-#include <gtest/gtest.h>
+#include "ProviderException.h"
+#include "TestSupport.h"
 
 #include <cstring>
 #include <string>
 #include <thread>
+
+#include <gtest/gtest.h>
 
 namespace
 {
@@ -21,32 +22,30 @@ TEST(TraceFormat, MessageLinePrintsTheTextLast)
 
 TEST(TraceFormat, EntryExitAndMethodLines)
 {
-    EXPECT_STREQ(QX::trace("SEL_GetInstance", "SELProvider.cpp", 12,
-                           QX::ENTRY_TRACE),
-                 "ENTERING: SEL_GetInstance() in SELProvider.cpp [Line: 12]");
+    EXPECT_STREQ(
+        QX::trace("SEL_GetInstance", "SELProvider.cpp", 12, QX::ENTRY_TRACE),
+        "ENTERING: SEL_GetInstance() in SELProvider.cpp [Line: 12]");
     EXPECT_STREQ(
         QX::trace("SEL_GetInstance", "SELProvider.cpp", 13, QX::EXIT_TRACE),
         "EXITING: SEL_GetInstance() in SELProvider.cpp [Line: 13]");
-    EXPECT_STREQ(
-        QX::trace("clearLog", "SEL.cpp", 14, QX::METHOD_TRACE),
-        "METHOD: clearLog() was invoked in SEL.cpp [Line: 14]");
+    EXPECT_STREQ(QX::trace("clearLog", "SEL.cpp", 14, QX::METHOD_TRACE),
+                 "METHOD: clearLog() was invoked in SEL.cpp [Line: 14]");
 }
 
 TEST(TraceFormat, UnknownKindsGiveEnteringLines)
 {
     for (const int kind : {0, 4, 5, 1000})
     {
-        EXPECT_STREQ(QX::trace("f", "SEL.cpp", 1,
-                               static_cast<QX::MessageType>(kind)),
-                     "ENTERING: f() in SEL.cpp [Line: 1]")
+        EXPECT_STREQ(
+            QX::trace("f", "SEL.cpp", 1, static_cast<QX::MessageType>(kind)),
+            "ENTERING: f() in SEL.cpp [Line: 1]")
             << "kind " << kind;
     }
 }
 
 TEST(TraceFormat, VariableLines)
 {
-    EXPECT_STREQ(QX::trace("classname", "SELProvider.cpp", 99,
-                           "ZAN_MgmtHwLog"),
+    EXPECT_STREQ(QX::trace("classname", "SELProvider.cpp", 99, "ZAN_MgmtHwLog"),
                  "VARIABLE: 'classname' has Value 'ZAN_MgmtHwLog' at line 99 "
                  "in SELProvider.cpp");
     EXPECT_STREQ(QX::trace("subscriberCountLogClearIndication",
@@ -72,12 +71,11 @@ TEST(TraceFormat, NullTextsPrintAsNull)
 TEST(TraceFormat, LongTextsAreCutToTheBuffer)
 {
     const std::string huge(10000, 'C');
-    const char* line = QX::trace("classname", "SELProvider.cpp", 3,
-                                 huge.c_str());
+    const char* line =
+        QX::trace("classname", "SELProvider.cpp", 3, huge.c_str());
     EXPECT_EQ(std::strlen(line), QX::TRACE_BUFFER_SIZE - 1);
-    EXPECT_EQ(std::string(line).rfind("VARIABLE: 'classname' has Value 'CCC",
-                                      0),
-              0u);
+    EXPECT_EQ(
+        std::string(line).rfind("VARIABLE: 'classname' has Value 'CCC", 0), 0u);
     const char* message =
         QX::trace(huge.c_str(), "SEL.cpp", 3, QX::MESSAGE_TRACE);
     EXPECT_EQ(std::strlen(message), QX::TRACE_BUFFER_SIZE - 1);
@@ -97,11 +95,12 @@ TEST(TraceFormat, EachFormatterHasItsOwnBuffer)
 
 TEST(TraceFormat, ConcurrentTracesAlwaysGiveWholeLines)
 {
-    auto worker = [](const char* name) {
+    auto worker = [](const char* name)
+    {
         for (int i = 0; i < 2000; ++i)
         {
-            const std::string expected = std::string("ENTERING: ") + name +
-                                         "() in f [Line: 1]";
+            const std::string expected =
+                std::string("ENTERING: ") + name + "() in f [Line: 1]";
             ASSERT_EQ(QX::trace(name, "f", 1, QX::ENTRY_TRACE), expected);
         }
     };
@@ -133,10 +132,9 @@ TEST_F(MarkingTest, EntryMarkingMakesFourLoggerCallsAtLevel4000)
     ASSERT_EQ(records.size(), 4u);
     const std::string entering =
         "ENTERING: SEL_EnumInstances() in SELProvider.cpp [Line: 42]";
-    const CVLog::Channel channels[] = {CVLog::Channel::Log,
-                                       CVLog::Channel::Trace,
-                                       CVLog::Channel::Log,
-                                       CVLog::Channel::Trace};
+    const CVLog::Channel channels[] = {
+        CVLog::Channel::Log, CVLog::Channel::Trace, CVLog::Channel::Log,
+        CVLog::Channel::Trace};
     const std::string messages[] = {QX::TRACE_BANNER, QX::TRACE_BANNER,
                                     entering, entering};
     const int lines[] = {336, 336, 337, 337};
@@ -180,9 +178,8 @@ TEST_F(MarkingTest, ErrorLineGoesToBothChannelsAt6000)
                    "getAllSELCMPIInstances Failed");
     const auto records = logRecords();
     ASSERT_EQ(records.size(), 2u);
-    const std::string line =
-        "MESSAGE [File: SELProvider.cpp, Line: 120]: "
-        "getAllSELCMPIInstances Failed";
+    const std::string line = "MESSAGE [File: SELProvider.cpp, Line: 120]: "
+                             "getAllSELCMPIInstances Failed";
     EXPECT_EQ(records[0].channel, CVLog::Channel::Log);
     EXPECT_EQ(records[1].channel, CVLog::Channel::Trace);
     for (const auto& record : records)

@@ -79,23 +79,26 @@ inline const char* trace(const char* functionOrText, const char* file,
     if (type == METHOD_TRACE)
     {
         std::snprintf(buffer, TRACE_BUFFER_SIZE,
-                      "METHOD: %s() was invoked in %s [Line: %d]", first,
-                      where, lineNumber);
+                      "METHOD: %s() was invoked in %s [Line: %d]", first, where,
+                      lineNumber);
     }
     else if (type == MESSAGE_TRACE)
     {
-        std::snprintf(buffer, TRACE_BUFFER_SIZE, "MESSAGE [File: %s, Line: %d]: %s",
-                      where, lineNumber, first);
+        std::snprintf(buffer, TRACE_BUFFER_SIZE,
+                      "MESSAGE [File: %s, Line: %d]: %s", where, lineNumber,
+                      first);
     }
     else if (type == EXIT_TRACE)
     {
-        std::snprintf(buffer, TRACE_BUFFER_SIZE, "EXITING: %s() in %s [Line: %d]",
-                      first, where, lineNumber);
+        std::snprintf(buffer, TRACE_BUFFER_SIZE,
+                      "EXITING: %s() in %s [Line: %d]", first, where,
+                      lineNumber);
     }
     else
     {
-        std::snprintf(buffer, TRACE_BUFFER_SIZE, "ENTERING: %s() in %s [Line: %d]",
-                      first, where, lineNumber);
+        std::snprintf(buffer, TRACE_BUFFER_SIZE,
+                      "ENTERING: %s() in %s [Line: %d]", first, where,
+                      lineNumber);
     }
     return buffer;
 }
@@ -136,8 +139,7 @@ inline const char* trace(const char* name, const char* file, unsigned line,
  */
 template <typename Format>
 void logAndTrace(const char* function, const char* file, int line,
-                 const std::string& component, int level,
-                 const Format& format)
+                 const std::string& component, int level, const Format& format)
 {
     CVLog::CVMessageBuffer buffer;
     buffer << format();
@@ -155,9 +157,11 @@ inline void logMessage(const char* function, const char* file, int line,
                        const std::string& component, int level,
                        const char* text)
 {
-    logAndTrace(function, file, line, component, level, [&] {
-        return trace(text, file, static_cast<unsigned>(line), MESSAGE_TRACE);
-    });
+    logAndTrace(function, file, line, component, level,
+                [&] {
+                    return trace(text, file, static_cast<unsigned>(line),
+                                 MESSAGE_TRACE);
+                });
 }
 
 /** Logs and traces a VARIABLE line at LOG_LEVEL_PROVIDER. */
@@ -165,18 +169,19 @@ template <typename Value>
 void logVariable(const char* function, const char* file, int line,
                  const std::string& component, const char* name, Value value)
 {
-    logAndTrace(function, file, line, component, LOG_LEVEL_PROVIDER, [&] {
-        return trace(name, file, static_cast<unsigned>(line), value);
-    });
+    logAndTrace(
+        function, file, line, component, LOG_LEVEL_PROVIDER,
+        [&] { return trace(name, file, static_cast<unsigned>(line), value); });
 }
 
 /** Logs and traces an ENTERING (or EXITING) line for @p function. */
 inline void logFunctionEdge(const char* function, const char* file, int line,
                             const std::string& component, MessageType type)
 {
-    logAndTrace(function, file, line, component, LOG_LEVEL_PROVIDER, [&] {
-        return trace(function, file, static_cast<unsigned>(line), type);
-    });
+    logAndTrace(
+        function, file, line, component, LOG_LEVEL_PROVIDER,
+        [&]
+        { return trace(function, file, static_cast<unsigned>(line), type); });
 }
 
 /** Frames a provider operation: banner, then its ENTERING line. */
@@ -192,9 +197,8 @@ inline void markProviderEntry(const std::string& component,
 }
 
 /** Closes the frame: the operation's EXITING line, then a banner. */
-inline void markProviderExit(const std::string& component,
-                             const char* function, const char* file,
-                             unsigned line)
+inline void markProviderExit(const std::string& component, const char* function,
+                             const char* file, unsigned line)
 {
     logAndTrace("markProviderExit", TRACE_HEADER_PATH, 348, component,
                 LOG_LEVEL_PROVIDER,
