@@ -57,17 +57,8 @@ CMPIData argsGetArg(const CMPIArgs* as, const char* name, CMPIStatus* rc)
         setStatus(rc, CMPI_RC_ERR_INVALID_HANDLE);
         return nullData();
     }
-    const Value* v = name ? findNamed(a->args, name) : nullptr;
-    if (v == nullptr)
-    {
-        setStatus(rc, name ? CMPI_RC_ERR_NO_SUCH_PROPERTY
-                           : CMPI_RC_ERR_INVALID_PARAMETER);
-        CMPIData d = nullData();
-        d.state |= CMPI_notFound;
-        return d;
-    }
-    setStatus(rc, CMPI_RC_OK);
-    return makeData(*a->broker, *v);
+    return lookupData(*a->broker, name ? findNamed(a->args, name) : nullptr,
+                      name, rc);
 }
 
 CMPIData argsGetArgAt(const CMPIArgs* as, CMPICount index, CMPIString** name,
@@ -79,20 +70,7 @@ CMPIData argsGetArgAt(const CMPIArgs* as, CMPICount index, CMPIString** name,
         setStatus(rc, CMPI_RC_ERR_INVALID_HANDLE);
         return nullData();
     }
-    if (index >= a->args.size())
-    {
-        setStatus(rc, CMPI_RC_ERR_NO_SUCH_PROPERTY);
-        return nullData();
-    }
-    const auto& [argName, value] = a->args[index];
-    if (name != nullptr)
-    {
-        auto* s = a->broker->make<StringObject>();
-        s->text = argName;
-        *name = &s->cmpi;
-    }
-    setStatus(rc, CMPI_RC_OK);
-    return makeData(*a->broker, value);
+    return indexedData(*a->broker, a->args, index, name, rc);
 }
 
 CMPICount argsGetArgCount(const CMPIArgs* as, CMPIStatus* rc)

@@ -51,17 +51,8 @@ CMPIData ctxGetEntry(const CMPIContext* ctx, const char* name, CMPIStatus* rc)
         setStatus(rc, CMPI_RC_ERR_INVALID_HANDLE);
         return nullData();
     }
-    const Value* v = name ? findEntry(*c, name) : nullptr;
-    if (v == nullptr)
-    {
-        setStatus(rc, name ? CMPI_RC_ERR_NO_SUCH_PROPERTY
-                           : CMPI_RC_ERR_INVALID_PARAMETER);
-        CMPIData d = nullData();
-        d.state |= CMPI_notFound;
-        return d;
-    }
-    setStatus(rc, CMPI_RC_OK);
-    return makeData(*c->broker, *v);
+    return lookupData(*c->broker, name ? findEntry(*c, name) : nullptr, name,
+                      rc);
 }
 
 CMPIData ctxGetEntryAt(const CMPIContext* ctx, CMPICount index,
@@ -73,20 +64,7 @@ CMPIData ctxGetEntryAt(const CMPIContext* ctx, CMPICount index,
         setStatus(rc, CMPI_RC_ERR_INVALID_HANDLE);
         return nullData();
     }
-    if (index >= c->entries.size())
-    {
-        setStatus(rc, CMPI_RC_ERR_NO_SUCH_PROPERTY);
-        return nullData();
-    }
-    const auto& [entryName, value] = c->entries[index];
-    if (name != nullptr)
-    {
-        auto* s = c->broker->make<StringObject>();
-        s->text = entryName;
-        *name = &s->cmpi;
-    }
-    setStatus(rc, CMPI_RC_OK);
-    return makeData(*c->broker, value);
+    return indexedData(*c->broker, c->entries, index, name, rc);
 }
 
 CMPICount ctxGetEntryCount(const CMPIContext* ctx, CMPIStatus* rc)

@@ -94,17 +94,8 @@ CMPIData instGetProperty(const CMPIInstance* inst, const char* name,
         setStatus(rc, CMPI_RC_ERR_INVALID_HANDLE);
         return nullData();
     }
-    const Value* v = name ? findNamed(i->properties, name) : nullptr;
-    if (v == nullptr)
-    {
-        setStatus(rc, name ? CMPI_RC_ERR_NO_SUCH_PROPERTY
-                           : CMPI_RC_ERR_INVALID_PARAMETER);
-        CMPIData d = nullData();
-        d.state |= CMPI_notFound;
-        return d;
-    }
-    setStatus(rc, CMPI_RC_OK);
-    return makeData(*i->broker, *v);
+    return lookupData(
+        *i->broker, name ? findNamed(i->properties, name) : nullptr, name, rc);
 }
 
 CMPIData instGetPropertyAt(const CMPIInstance* inst, CMPICount index,
@@ -116,20 +107,7 @@ CMPIData instGetPropertyAt(const CMPIInstance* inst, CMPICount index,
         setStatus(rc, CMPI_RC_ERR_INVALID_HANDLE);
         return nullData();
     }
-    if (index >= i->properties.size())
-    {
-        setStatus(rc, CMPI_RC_ERR_NO_SUCH_PROPERTY);
-        return nullData();
-    }
-    const auto& [propertyName, value] = i->properties[index];
-    if (name != nullptr)
-    {
-        auto* s = i->broker->make<StringObject>();
-        s->text = propertyName;
-        *name = &s->cmpi;
-    }
-    setStatus(rc, CMPI_RC_OK);
-    return makeData(*i->broker, value);
+    return indexedData(*i->broker, i->properties, index, name, rc);
 }
 
 CMPICount instGetPropertyCount(const CMPIInstance* inst, CMPIStatus* rc)

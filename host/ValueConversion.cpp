@@ -305,4 +305,38 @@ CMPIData makeData(BrokerState& broker, const Value& value,
     return d;
 }
 
+CMPIData lookupData(BrokerState& broker, const Value* found, const char* name,
+                    CMPIStatus* rc)
+{
+    if (found == nullptr)
+    {
+        setStatus(rc, name ? CMPI_RC_ERR_NO_SUCH_PROPERTY
+                           : CMPI_RC_ERR_INVALID_PARAMETER);
+        CMPIData d = nullData();
+        d.state |= CMPI_notFound;
+        return d;
+    }
+    setStatus(rc, CMPI_RC_OK);
+    return makeData(broker, *found);
+}
+
+CMPIData indexedData(BrokerState& broker, const NamedValues& values,
+                     CMPICount index, CMPIString** name, CMPIStatus* rc)
+{
+    if (index >= values.size())
+    {
+        setStatus(rc, CMPI_RC_ERR_NO_SUCH_PROPERTY);
+        return nullData();
+    }
+    const auto& [valueName, value] = values[index];
+    if (name != nullptr)
+    {
+        auto* s = broker.make<StringObject>();
+        s->text = valueName;
+        *name = &s->cmpi;
+    }
+    setStatus(rc, CMPI_RC_OK);
+    return makeData(broker, value);
+}
+
 } // namespace host::detail

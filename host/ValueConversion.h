@@ -25,4 +25,15 @@ CMPIrc readData(const CMPIData& data, Value& out);
 CMPIData makeData(BrokerState& broker, const Value& value,
                   CMPIValueState extraState = CMPI_goodValue);
 
+// The answer to a lookup by name (getProperty, getEntry, getArg): the found
+// value, or a null marked not found with CMPI_RC_ERR_NO_SUCH_PROPERTY
+// (CMPI_RC_ERR_INVALID_PARAMETER when no name was given).
+CMPIData lookupData(BrokerState& broker, const Value* found, const char* name,
+                    CMPIStatus* rc);
+
+// The answer to a lookup by position (getPropertyAt, getEntryAt,
+// getArgAt), handing out the name as a new string when asked for.
+CMPIData indexedData(BrokerState& broker, const NamedValues& values,
+                     CMPICount index, CMPIString** name, CMPIStatus* rc);
+
 } // namespace host::detail

@@ -48,6 +48,29 @@ std::uint16_t countOf(const std::vector<CMPIInstance*>& instances)
     return static_cast<std::uint16_t>(instances.size());
 }
 
+/**
+ * Builds every instance of the request's class into @p instances. When the
+ * factory reports failure, logs it and returns false: the caller then
+ * returns the status as the factory left it, without any result.
+ */
+bool buildInstances(const char* function, SELObjectFactory& factory,
+                    const CMPIContext* context, const CMPIObjectPath* path,
+                    const char* className, const char** properties,
+                    std::vector<CMPIInstance*>& instances, CMPIStatus* status)
+{
+    instances.reserve(
+        static_cast<std::uint16_t>(factory.getNumberOfInstances()));
+    if (factory.getAllSELCMPIInstances(broker.load(), context, path, className,
+                                       properties, false, instances,
+                                       status) == 0)
+    {
+        return true;
+    }
+    logMessage(function, unitFile, __LINE__, loggerSELProvider,
+               LOG_LEVEL_FAILURE, factoryFailedText);
+    return false;
+}
+
 } // namespace
 
 CMPIStatus SEL_EnumInstanceNames(CMPIInstanceMI*, const CMPIContext* context,
@@ -62,14 +85,9 @@ CMPIStatus SEL_EnumInstanceNames(CMPIInstanceMI*, const CMPIContext* context,
     logVariable(function, unitFile, __LINE__, loggerSELProvider, "classname",
                 className);
     std::vector<CMPIInstance*> instances;
-    instances.reserve(
-        static_cast<std::uint16_t>(factory.getNumberOfInstances()));
-    if (factory.getAllSELCMPIInstances(broker.load(), context, reference,
-                                       className, nullptr, false, instances,
-                                       &status) != 0)
+    if (!buildInstances(function, factory, context, reference, className,
+                        nullptr, instances, &status))
     {
-        logMessage(function, unitFile, __LINE__, loggerSELProvider,
-                   LOG_LEVEL_FAILURE, factoryFailedText);
         markExit(function, __LINE__);
         return status;
     }
@@ -109,14 +127,9 @@ CMPIStatus SEL_EnumInstances(CMPIInstanceMI*, const CMPIContext* context,
                 className);
     SELObjectFactory factory(className);
     std::vector<CMPIInstance*> instances;
-    instances.reserve(
-        static_cast<std::uint16_t>(factory.getNumberOfInstances()));
-    if (factory.getAllSELCMPIInstances(broker.load(), context, reference,
-                                       className, properties, false, instances,
-                                       &status) != 0)
+    if (!buildInstances(function, factory, context, reference, className,
+                        properties, instances, &status))
     {
-        logMessage(function, unitFile, __LINE__, loggerSELProvider,
-                   LOG_LEVEL_FAILURE, factoryFailedText);
         markExit(function, __LINE__);
         return status;
     }
@@ -160,14 +173,9 @@ CMPIStatus SEL_GetInstance(CMPIInstanceMI*, const CMPIContext* context,
                 className);
     SELObjectFactory factory(className);
     std::vector<CMPIInstance*> instances;
-    instances.reserve(
-        static_cast<std::uint16_t>(factory.getNumberOfInstances()));
-    if (factory.getAllSELCMPIInstances(currentBroker, context, objectPath,
-                                       className, properties, false, instances,
-                                       &status) != 0)
+    if (!buildInstances(function, factory, context, objectPath, className,
+                        properties, instances, &status))
     {
-        logMessage(function, unitFile, __LINE__, loggerSELProvider,
-                   LOG_LEVEL_FAILURE, factoryFailedText);
         markExit(function, __LINE__);
         return status;
     }

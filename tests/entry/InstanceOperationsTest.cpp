@@ -239,6 +239,32 @@ TEST_F(InstanceOperations, GetInstanceMatchesKeyNamesIgnoringCase)
     EXPECT_EQ(outcome.instances[0].property("Name")->text, "IPMI SEL Log");
 }
 
+TEST_F(InstanceOperations, GetInstanceListingKeysFindsTheEntry)
+{
+    install(selTree(3));
+    const host::ObjectPath target = firstEntryPath();
+    const std::vector<std::string> keysAndNode = {
+        "RecordID", "LogCreationClassName", "MessageTimestamp", "LogName",
+        "Node"};
+    const auto outcome = host().getInstance(target, &keysAndNode);
+    ASSERT_EQ(outcome.instances.size(), 1u);
+    EXPECT_EQ(outcome.instances[0].property("Node")->u, 1u);
+    EXPECT_EQ(outcome.instances[0].property("Description"), nullptr);
+}
+
+TEST_F(InstanceOperations, GetInstanceWithoutKeyPropertiesMatchesNothing)
+{
+    // Entry keys other than the class name are set only when requested, so
+    // an instance built for a list without them has no full path to match.
+    install(selTree(3));
+    const host::ObjectPath target = firstEntryPath();
+    const std::vector<std::string> nodeOnly = {"Node"};
+    const auto outcome = host().getInstance(target, &nodeOnly);
+    EXPECT_EQ(outcome.rc, CMPI_RC_OK);
+    EXPECT_TRUE(outcome.done);
+    EXPECT_TRUE(outcome.instances.empty());
+}
+
 TEST_F(InstanceOperations, GetInstanceWithoutMatchDeliversNothing)
 {
     install(selTree(2));
