@@ -1,3 +1,4 @@
+#include "CVLogger.h"
 #include "EntryFixture.h"
 #include "Support.h"
 
@@ -387,6 +388,82 @@ TEST_F(InstanceOperations, CountIsTakenModulo65536)
     outcome = host().enumerateInstances(classPath("ZAN_MgmtHwLogEntry"), &none);
     EXPECT_TRUE(outcome.done);
     EXPECT_TRUE(outcome.instances.empty());
+}
+
+} // namespace
+
+namespace
+{
+
+class OperationDiagnostics : public entry::ProviderTest
+{
+  protected:
+    void SetUp() override
+    {
+        ProviderTest::SetUp();
+        capture_ = std::make_shared<CVLog::CaptureSink>();
+        previous_ = CVLog::CVLogger::settings();
+        CVLog::CVLogger::setSink(capture_);
+        CVLog::LoggerSettings all;
+        all.logLevel = 1;
+        all.traceLevel = 1;
+        CVLog::CVLogger::configure(all);
+    }
+    void TearDown() override
+    {
+        CVLog::CVLogger::configure(previous_);
+        CVLog::CVLogger::setSink(nullptr);
+        ProviderTest::TearDown();
+    }
+
+    std::shared_ptr<CVLog::CaptureSink> capture_;
+    CVLog::LoggerSettings previous_;
+};
+
+TEST_F(OperationDiagnostics, EnumerationIsFramedAndNamesItsClass)
+{
+    install(selTree(1));
+    host().enumerateInstances(entry::classPath("ZAN_MgmtHwLog"));
+    const auto records = capture_->records();
+    ASSERT_GE(records.size(), 8u);
+    EXPECT_EQ(records[0].message, std::string(78, '='));
+    EXPECT_EQ(
+        records[2].message.rfind(
+            "ENTERING: SEL_EnumInstances() in SELProvider.cpp [Line: ", 0),
+        0u);
+    EXPECT_EQ(records[4].message.rfind("VARIABLE: 'classname' has Value "
+                                       "'ZAN_MgmtHwLog' at line ",
+                                       0),
+              0u);
+    EXPECT_EQ(records[4].function, "SEL_EnumInstances");
+    EXPECT_EQ(records[4].file, "SELProvider.cpp");
+    EXPECT_EQ(records.back().message, std::string(78, '='));
+    EXPECT_EQ(records[records.size() - 3].message.rfind(
+                  "EXITING: SEL_EnumInstances() in SELProvider.cpp", 0),
+              0u);
+    for (const auto& record : records)
+    {
+        EXPECT_EQ(record.level, 4000) << record.message;
+        EXPECT_EQ(record.component, "Corvane.SELProvider");
+    }
+}
+
+TEST_F(OperationDiagnostics, FactoryFailureIsLoggedAt6000)
+{
+    install(selTree(1));
+    host().enumerateInstanceNames(entry::classPath("ZAN_Other"));
+    int failures = 0;
+    for (const auto& record : capture_->records())
+    {
+        if (record.message.find("getAllSELCMPIInstances Failed") !=
+            std::string::npos)
+        {
+            EXPECT_EQ(record.level, 6000);
+            EXPECT_EQ(record.function, "SEL_EnumInstanceNames");
+            ++failures;
+        }
+    }
+    EXPECT_EQ(failures, 2);
 }
 
 } // namespace

@@ -154,3 +154,86 @@ TEST_F(Builders, NullPathFromBrokerGivesNullAndLeavesStatusAlone)
 }
 
 } // namespace
+
+namespace
+{
+
+class Collection : public PlatformTest
+{
+  protected:
+    std::vector<host::Instance> collect(const char* className)
+    {
+        QX::SELComposite::SELObjectFactory factory(className);
+        host::Broker::Request request(broker_);
+        std::vector<CMPIInstance*> instances;
+        CMPIStatus status{CMPI_RC_OK, nullptr};
+        lastResult_ = factory.getAllSELCMPIInstances(
+            broker_.cmpi(), request.context(),
+            broker_.makeObjectPath(classPath(className)), className, nullptr,
+            false, instances, &status);
+        std::vector<host::Instance> copies;
+        for (const CMPIInstance* instance : instances)
+        {
+            copies.push_back(host::Broker::toInstance(instance));
+        }
+        request.finish(status);
+        return copies;
+    }
+
+    host::Broker broker_;
+    unsigned lastResult_ = 0;
+};
+
+TEST_F(Collection, EntriesComeInByteOrderOfTheirKeysNotInWalkOrder)
+{
+    using namespace QX::NodeLexicon;
+    auto tree = testsupport::standardTree(0);
+    for (const char* path : {"/bmc0/sel/z", "/bmc0/sel/B", "/bmc0/sel/a"})
+    {
+        tree.addNode(EventLogEntry, path, "/bmc0/sel", path, 1);
+    }
+    install(tree);
+    const auto instances = collect("ZAN_MgmtHwLogEntry");
+    EXPECT_EQ(lastResult_, 0u);
+    ASSERT_EQ(instances.size(), 3u);
+    EXPECT_EQ(instances[0].property("Description")->text, "/bmc0/sel/B");
+    EXPECT_EQ(instances[1].property("Description")->text, "/bmc0/sel/a");
+    EXPECT_EQ(instances[2].property("Description")->text, "/bmc0/sel/z");
+    // The walk ordinal stays that of the hardware order.
+    EXPECT_EQ(instances[0].property("Node")->u, 2u);
+}
+
+TEST_F(Collection, UnknownClassIsLoggedAtLevel6000)
+{
+    install(testsupport::standardTree(1));
+    EXPECT_TRUE(collect("ZAN_Unknown").empty());
+    EXPECT_EQ(lastResult_, 1u);
+    const auto lines = recordsContaining("No instance found");
+    ASSERT_EQ(lines.size(), 2u);
+    EXPECT_EQ(lines[0].level, 6000);
+    EXPECT_EQ(lines[1].level, 6000);
+    EXPECT_EQ(lines[0].file, "SELObjectFactory.cpp");
+    EXPECT_EQ(lines[0].message.rfind(
+                  "MESSAGE [File: SELObjectFactory.cpp, Line: ", 0),
+              0u);
+    EXPECT_EQ(lines[0].message.substr(lines[0].message.size() - 20),
+              "]: No instance found");
+    const auto exits = recordsContaining("EXITING: getAllSELCMPIInstances()");
+    ASSERT_EQ(exits.size(), 2u);
+    EXPECT_EQ(exits[0].level, 4000);
+    const auto traces = broker_.traces();
+    ASSERT_EQ(traces.size(), 1u);
+    EXPECT_EQ(traces[0].text, "***No instance found***");
+    EXPECT_EQ(traces[0].level, CMPI_LEV_WARNING);
+}
+
+TEST_F(Collection, OneLogRecordGivesOneInstance)
+{
+    install(testsupport::standardTree(4));
+    const auto instances = collect("ZAN_MgmtHwLog");
+    EXPECT_EQ(lastResult_, 0u);
+    ASSERT_EQ(instances.size(), 1u);
+    EXPECT_EQ(instances[0].property("CurrentNumberOfRecords")->u, 4u);
+}
+
+} // namespace
