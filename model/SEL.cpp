@@ -9,6 +9,7 @@
 #include <exception>
 #include <iostream>
 #include <sstream>
+#include <utility>
 
 namespace QX::SELComposite
 {
@@ -116,7 +117,7 @@ int getMgmtHwLogInstances(LogMap& logs)
                         throw ProviderException(
                             "Failed while setting Node Property");
                     }
-                    logs[key] = log;
+                    logs[key] = std::move(log);
                     ++logCursor;
                 }
                 status = 0;
@@ -204,7 +205,7 @@ int getMgmtHwLogEntryInstances(EntryMap& entries)
                             entry.messageTimestamp =
                                 convertTimestampToCIM(scratch);
                         }
-                        entries[key] = entry;
+                        entries[key] = std::move(entry);
                         ++entryCursor;
                     }
                     status = 0;
