@@ -1,0 +1,178 @@
+// selprov, the main job's command, run as a user runs it: a separate
+// process on the shipped sample SEL or on a fixture named by --config.
+#include <array>
+#include <cstdio>
+#include <filesystem>
+#include <fstream>
+#include <string>
+#include <sys/wait.h>
+
+#include <gtest/gtest.h>
+
+namespace
+{
+
+struct CommandResult
+{
+    int exitCode = -1;
+    std::string output;
+};
+
+/** Runs a shell command line with a bounded run time; captures standard
+ *  output (and standard error when @p withErrors). */
+CommandResult run(const std::string& commandLine, bool withErrors = false)
+{
+    const std::string full =
+        "timeout 60 " + commandLine + (withErrors ? " 2>&1" : " 2>/dev/null");
+    CommandResult result;
+    FILE* pipe = ::popen(full.c_str(), "r");
+    if (pipe == nullptr)
+    {
+        return result;
+    }
+    std::array<char, 4096> buffer{};
+    std::size_t n = 0;
+    while ((n = std::fread(buffer.data(), 1, buffer.size(), pipe)) > 0)
+    {
+        result.output.append(buffer.data(), n);
+    }
+    const int status = ::pclose(pipe);
+    result.exitCode = WIFEXITED(status) ? WEXITSTATUS(status) : -1;
+    return result;
+}
+
+class Selprov : public ::testing::Test
+{
+  protected:
+    void SetUp() override
+    {
+        directory_ = std::filesystem::temp_directory_path() /
+                     ("selprov-test-" + std::to_string(::getpid()));
+        std::filesystem::create_directories(directory_);
+        // The built-in sample, whatever /etc/qx/platform.conf says.
+        writeConfig("sample.conf", "source = memory\nlog.sink = none\n");
+    }
+    void TearDown() override
+    {
+        std::filesystem::remove_all(directory_);
+    }
+
+    std::string writeConfig(const std::string& name, const std::string& text)
+    {
+        const auto path = directory_ / name;
+        std::ofstream(path) << text;
+        return path.string();
+    }
+
+    std::string selprov(const std::string& config = "sample.conf") const
+    {
+        return std::string(SELPROV_BIN_DIR) + "/selprov --config " +
+               (directory_ / config).string() + " ";
+    }
+
+    std::filesystem::path directory_;
+};
+
+std::size_t countLines(const std::string& text)
+{
+    std::size_t lines = 0;
+    for (const char c : text)
+    {
+        lines += c == '\n';
+    }
+    return lines;
+}
+
+TEST_F(Selprov, SampleLogIsServed)
+{
+    const CommandResult names =
+        run(selprov() + "enumerate-names ZAN_MgmtHwLog");
+    EXPECT_EQ(names.exitCode, 0);
+    EXPECT_NE(names.output.find("root/zanqx:ZAN_MgmtHwLog.CreationClassName="
+                                "\"ZAN_MgmtHwLog\",Name=\"IPMI SEL Log\""),
+              std::string::npos)
+        << names.output;
+    const CommandResult log = run(selprov() + "enumerate ZAN_MgmtHwLog");
+    EXPECT_EQ(log.exitCode, 0);
+    EXPECT_NE(log.output.find("instance of ZAN_MgmtHwLog"), std::string::npos);
+    EXPECT_NE(log.output.find("OperationalStatus = {2, 11};"),
+              std::string::npos)
+        << log.output;
+}
+
+TEST_F(Selprov, EntriesCanBeListedAndFetchedByPath)
+{
+    const CommandResult names =
+        run(selprov() + "enumerate-names ZAN_MgmtHwLogEntry");
+    ASSERT_EQ(names.exitCode, 0);
+    EXPECT_GE(countLines(names.output), 20u);
+    const std::string first = names.output.substr(0, names.output.find('\n'));
+    const CommandResult one = run(selprov() + "get '" + first + "'");
+    EXPECT_EQ(one.exitCode, 0);
+    EXPECT_NE(one.output.find("RecordID = \"1\";"), std::string::npos)
+        << one.output;
+    EXPECT_EQ(one.output.find("instance of"), one.output.rfind("instance of"))
+        << "exactly one instance";
+}
+
+TEST_F(Selprov, ClearLogInOneProcessEmptiesTheLog)
+{
+    const CommandResult batch = run("printf 'clear-log\\nenumerate-names "
+                                    "ZAN_MgmtHwLogEntry\\n' | " +
+                                    selprov() + "batch");
+    EXPECT_EQ(batch.exitCode, 0);
+    EXPECT_EQ(batch.output, "ReturnValue = 0\n");
+}
+
+TEST_F(Selprov, JsonOutputIsStructured)
+{
+    const CommandResult json =
+        run(selprov() + "--json enumerate ZAN_MgmtHwLogEntry --properties "
+                        "RecordID,Node");
+    EXPECT_EQ(json.exitCode, 0);
+    ASSERT_FALSE(json.output.empty());
+    EXPECT_EQ(json.output.front(), '[');
+    EXPECT_NE(json.output.find("\"RecordID\": \"1\""), std::string::npos)
+        << json.output.substr(0, 400);
+    EXPECT_NE(json.output.find("\"Node\": 1"), std::string::npos);
+}
+
+TEST_F(Selprov, FailedRequestPrintsTheCmpiStatus)
+{
+    const CommandResult failed =
+        run(selprov() + "get 'root/zanqx:ZAN_MgmtHwLog'", true);
+    EXPECT_EQ(failed.exitCode, 1);
+    EXPECT_NE(failed.output.find("At least one key should be passed"),
+              std::string::npos)
+        << failed.output;
+}
+
+TEST_F(Selprov, LargeGeneratedLogIsServedWhole)
+{
+    const std::string fixture = (directory_ / "big.fixture").string();
+    ASSERT_EQ(
+        run(std::string(SELPROV_BIN_DIR) + "/selfixture 65535 > " + fixture)
+            .exitCode,
+        0);
+    writeConfig("big.conf",
+                "memory.fixture = " + fixture + "\nlog.sink = none\n");
+    const CommandResult names =
+        run(selprov("big.conf") + "enumerate-names ZAN_MgmtHwLogEntry");
+    EXPECT_EQ(names.exitCode, 0);
+    EXPECT_EQ(countLines(names.output), 65535u);
+}
+
+TEST_F(Selprov, BrokenFixtureIsReportedNotCrashed)
+{
+    const std::string fixture = (directory_ / "broken.fixture").string();
+    std::ofstream(fixture) << "controller path=/bmc0 status=x\n";
+    writeConfig("broken.conf",
+                "memory.fixture = " + fixture + "\nlog.sink = none\n");
+    const CommandResult result =
+        run(selprov("broken.conf") + "enumerate ZAN_MgmtHwLogEntry", true);
+    EXPECT_EQ(result.exitCode, 0) << "an empty answer, as for a dead BMC";
+    EXPECT_NE(result.output.find("broken.fixture:1:"), std::string::npos)
+        << result.output;
+}
+
+} // namespace
