@@ -37,9 +37,9 @@ const char* classNameOf(const CMPIObjectPath* path, CMPIStatus* status)
     return charsOf(path->ft->getClassName(path, status), status);
 }
 
-const char* nameSpaceOf(const CMPIObjectPath* path)
+const char* nameSpaceOf(const CMPIObjectPath* path, CMPIStatus* status)
 {
-    return charsOf(path->ft->getNameSpace(path, nullptr), nullptr);
+    return charsOf(path->ft->getNameSpace(path, status), status);
 }
 
 /** The loops run over the instance count taken as 16 bits. */
@@ -100,12 +100,12 @@ CMPIStatus SEL_EnumInstanceNames(CMPIInstanceMI*, const CMPIContext* context,
         {
             continue;
         }
-        CMPIObjectPath* path = instance->ft->getObjectPath(instance, nullptr);
+        CMPIObjectPath* path = instance->ft->getObjectPath(instance, &status);
         if (!isUsable(path))
         {
             continue;
         }
-        path->ft->setNameSpace(path, nameSpaceOf(reference));
+        path->ft->setNameSpace(path, nameSpaceOf(reference, &status));
         path->ft->setHostname(path, hostName.c_str());
         result->ft->returnObjectPath(result, path);
     }
@@ -152,7 +152,7 @@ CMPIStatus SEL_GetInstance(CMPIInstanceMI*, const CMPIContext* context,
     markEntry(function, __LINE__);
     CMPIStatus status{CMPI_RC_OK, nullptr};
     const CMPIBroker* const currentBroker = broker.load();
-    if (objectPath->ft->getKeyCount(objectPath, nullptr) == 0)
+    if (objectPath->ft->getKeyCount(objectPath, &status) == 0)
     {
         status.rc = CMPI_RC_ERR_FAILED;
         if (currentBroker != nullptr)
@@ -188,7 +188,7 @@ CMPIStatus SEL_GetInstance(CMPIInstanceMI*, const CMPIContext* context,
             continue;
         }
         const CMPIObjectPath* path =
-            instance->ft->getObjectPath(instance, nullptr);
+            instance->ft->getObjectPath(instance, &status);
         if (isObjPathsEqual(path, objectPath, false))
         {
             result->ft->returnInstance(result, instance);
