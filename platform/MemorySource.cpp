@@ -111,6 +111,10 @@ void MemorySource::stopMonitoring(NodeLexicon::NodeType kind,
 
 void MemorySource::beforeOperation(CursorOperation operation)
 {
+    if (!faultsArmed_.load(std::memory_order_acquire))
+    {
+        return;
+    }
     const std::lock_guard lock(mutex_);
     std::optional<std::string> failure;
     for (auto armed = faults_.begin(); armed != faults_.end();)
@@ -132,6 +136,7 @@ void MemorySource::beforeOperation(CursorOperation operation)
         }
         ++armed;
     }
+    faultsArmed_.store(!faults_.empty(), std::memory_order_release);
     if (failure)
     {
         throw std::runtime_error(*failure);
@@ -199,12 +204,14 @@ void MemorySource::armFault(const CursorFault& fault)
 {
     const std::lock_guard lock(mutex_);
     faults_.push_back(ArmedFault{fault, 0});
+    faultsArmed_.store(true, std::memory_order_release);
 }
 
 void MemorySource::clearFaults()
 {
     const std::lock_guard lock(mutex_);
     faults_.clear();
+    faultsArmed_.store(false, std::memory_order_release);
 }
 
 void MemorySource::refuseWrites(bool refuse)

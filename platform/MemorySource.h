@@ -2,6 +2,7 @@
 
 #include "InstrumentationSource.h"
 
+#include <atomic>
 #include <mutex>
 #include <optional>
 #include <string>
@@ -103,6 +104,8 @@ class MemorySource : public InstrumentationSource
     std::shared_ptr<const NodeTree> tree_;
     std::vector<Monitor> monitors_;
     std::vector<ArmedFault> faults_;
+    // Lets cursor operations skip the lock while no fault is armed.
+    std::atomic<bool> faultsArmed_{false};
     bool refuseWrites_ = false;
     unsigned acceptedWrites_ = 0;
 };
