@@ -9,22 +9,13 @@ namespace
 
 CMPIStatus argsRelease(CMPIArgs* as)
 {
-    ArgsObject* a = ArgsObject::of(as);
-    return a ? a->broker->release(a) : errorStatus(CMPI_RC_ERR_INVALID_HANDLE);
+    return releaseObject<ArgsObject>(as);
 }
 
 CMPIArgs* argsClone(const CMPIArgs* as, CMPIStatus* rc)
 {
-    const ArgsObject* a = ArgsObject::of(as);
-    if (a == nullptr)
-    {
-        setStatus(rc, CMPI_RC_ERR_INVALID_HANDLE);
-        return nullptr;
-    }
-    auto* copy = a->broker->makeOwned<ArgsObject>(Ownership::Clone);
-    copy->args = a->args;
-    setStatus(rc, CMPI_RC_OK);
-    return &copy->cmpi;
+    return cloneObject<ArgsObject>(
+        as, rc, [](auto& to, const auto& from) { to.args = from.args; });
 }
 
 CMPIStatus argsAddArg(const CMPIArgs* as, const char* name,

@@ -9,23 +9,17 @@ namespace
 
 CMPIStatus arrayRelease(CMPIArray* ar)
 {
-    ArrayObject* a = ArrayObject::of(ar);
-    return a ? a->broker->release(a) : errorStatus(CMPI_RC_ERR_INVALID_HANDLE);
+    return releaseObject<ArrayObject>(ar);
 }
 
 CMPIArray* arrayClone(const CMPIArray* ar, CMPIStatus* rc)
 {
-    const ArrayObject* a = ArrayObject::of(ar);
-    if (a == nullptr)
-    {
-        setStatus(rc, CMPI_RC_ERR_INVALID_HANDLE);
-        return nullptr;
-    }
-    auto* copy = a->broker->makeOwned<ArrayObject>(Ownership::Clone);
-    copy->elementType = a->elementType;
-    copy->elements = a->elements;
-    setStatus(rc, CMPI_RC_OK);
-    return &copy->cmpi;
+    return cloneObject<ArrayObject>(ar, rc,
+                                    [](auto& to, const auto& from)
+                                    {
+                                        to.elementType = from.elementType;
+                                        to.elements = from.elements;
+                                    });
 }
 
 CMPICount arrayGetSize(const CMPIArray* ar, CMPIStatus* rc)

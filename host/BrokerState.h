@@ -115,4 +115,30 @@ auto* deliver(T* object, std::optional<FaultMode> fault, CMPIStatus* rc)
     return &object->cmpi;
 }
 
+// release() of every object table: frees clones and prepared contexts.
+template <typename Object, typename Handle>
+CMPIStatus releaseObject(Handle* handle)
+{
+    Object* object = Object::of(handle);
+    return object ? object->broker->release(object)
+                  : errorStatus(CMPI_RC_ERR_INVALID_HANDLE);
+}
+
+// clone() of every object table: a new broker-owned object of the same
+// type whose own state @p copyState copies over.
+template <typename Object, typename Handle, typename CopyState>
+Handle* cloneObject(const Handle* handle, CMPIStatus* rc, CopyState copyState)
+{
+    const Object* object = Object::of(handle);
+    if (object == nullptr)
+    {
+        setStatus(rc, CMPI_RC_ERR_INVALID_HANDLE);
+        return nullptr;
+    }
+    auto* copy = object->broker->template makeOwned<Object>(Ownership::Clone);
+    copyState(*copy, *object);
+    setStatus(rc, CMPI_RC_OK);
+    return &copy->cmpi;
+}
+
 } // namespace host::detail

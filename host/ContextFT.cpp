@@ -25,22 +25,13 @@ const Value* findEntry(const Ctx& c, const char* name)
 
 CMPIStatus ctxRelease(CMPIContext* ctx)
 {
-    Ctx* c = Ctx::of(ctx);
-    return c ? c->broker->release(c) : errorStatus(CMPI_RC_ERR_INVALID_HANDLE);
+    return releaseObject<Ctx>(ctx);
 }
 
 CMPIContext* ctxClone(const CMPIContext* ctx, CMPIStatus* rc)
 {
-    const Ctx* c = Ctx::of(ctx);
-    if (c == nullptr)
-    {
-        setStatus(rc, CMPI_RC_ERR_INVALID_HANDLE);
-        return nullptr;
-    }
-    auto* copy = c->broker->makeOwned<Ctx>(Ownership::Clone);
-    copy->entries = c->entries;
-    setStatus(rc, CMPI_RC_OK);
-    return &copy->cmpi;
+    return cloneObject<Ctx>(
+        ctx, rc, [](auto& to, const auto& from) { to.entries = from.entries; });
 }
 
 CMPIData ctxGetEntry(const CMPIContext* ctx, const char* name, CMPIStatus* rc)

@@ -9,22 +9,13 @@ namespace
 
 CMPIStatus dateTimeRelease(CMPIDateTime* dt)
 {
-    DateTimeObject* d = DateTimeObject::of(dt);
-    return d ? d->broker->release(d) : errorStatus(CMPI_RC_ERR_INVALID_HANDLE);
+    return releaseObject<DateTimeObject>(dt);
 }
 
 CMPIDateTime* dateTimeClone(const CMPIDateTime* dt, CMPIStatus* rc)
 {
-    const DateTimeObject* d = DateTimeObject::of(dt);
-    if (d == nullptr)
-    {
-        setStatus(rc, CMPI_RC_ERR_INVALID_HANDLE);
-        return nullptr;
-    }
-    auto* copy = d->broker->makeOwned<DateTimeObject>(Ownership::Clone);
-    copy->text = d->text;
-    setStatus(rc, CMPI_RC_OK);
-    return &copy->cmpi;
+    return cloneObject<DateTimeObject>(
+        dt, rc, [](auto& to, const auto& from) { to.text = from.text; });
 }
 
 CMPIUint64 dateTimeGetBinaryFormat(const CMPIDateTime* dt, CMPIStatus* rc)

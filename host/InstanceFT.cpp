@@ -64,25 +64,19 @@ using Inst = InstanceObject;
 
 CMPIStatus instRelease(CMPIInstance* inst)
 {
-    Inst* i = Inst::of(inst);
-    return i ? i->broker->release(i) : errorStatus(CMPI_RC_ERR_INVALID_HANDLE);
+    return releaseObject<Inst>(inst);
 }
 
 CMPIInstance* instClone(const CMPIInstance* inst, CMPIStatus* rc)
 {
-    const Inst* i = Inst::of(inst);
-    if (i == nullptr)
-    {
-        setStatus(rc, CMPI_RC_ERR_INVALID_HANDLE);
-        return nullptr;
-    }
-    auto* copy = i->broker->makeOwned<Inst>(Ownership::Clone);
-    copy->path = i->path;
-    copy->properties = i->properties;
-    copy->filter = i->filter;
-    copy->filterKeys = i->filterKeys;
-    setStatus(rc, CMPI_RC_OK);
-    return &copy->cmpi;
+    return cloneObject<Inst>(inst, rc,
+                             [](auto& to, const auto& from)
+                             {
+                                 to.path = from.path;
+                                 to.properties = from.properties;
+                                 to.filter = from.filter;
+                                 to.filterKeys = from.filterKeys;
+                             });
 }
 
 CMPIData instGetProperty(const CMPIInstance* inst, const char* name,

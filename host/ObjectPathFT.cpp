@@ -11,22 +11,13 @@ using Op = ObjectPathObject;
 
 CMPIStatus opRelease(CMPIObjectPath* op)
 {
-    Op* p = Op::of(op);
-    return p ? p->broker->release(p) : errorStatus(CMPI_RC_ERR_INVALID_HANDLE);
+    return releaseObject<Op>(op);
 }
 
 CMPIObjectPath* opClone(const CMPIObjectPath* op, CMPIStatus* rc)
 {
-    const Op* p = Op::of(op);
-    if (p == nullptr)
-    {
-        setStatus(rc, CMPI_RC_ERR_INVALID_HANDLE);
-        return nullptr;
-    }
-    auto* copy = p->broker->makeOwned<Op>(Ownership::Clone);
-    copy->path = p->path;
-    setStatus(rc, CMPI_RC_OK);
-    return &copy->cmpi;
+    return cloneObject<Op>(
+        op, rc, [](auto& to, const auto& from) { to.path = from.path; });
 }
 
 CMPIStatus setText(CMPIObjectPath* op, const char* text,

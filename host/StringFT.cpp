@@ -8,22 +8,13 @@ namespace
 
 CMPIStatus stringRelease(CMPIString* st)
 {
-    StringObject* s = StringObject::of(st);
-    return s ? s->broker->release(s) : errorStatus(CMPI_RC_ERR_INVALID_HANDLE);
+    return releaseObject<StringObject>(st);
 }
 
 CMPIString* stringClone(const CMPIString* st, CMPIStatus* rc)
 {
-    const StringObject* s = StringObject::of(st);
-    if (s == nullptr)
-    {
-        setStatus(rc, CMPI_RC_ERR_INVALID_HANDLE);
-        return nullptr;
-    }
-    auto* copy = s->broker->makeOwned<StringObject>(Ownership::Clone);
-    copy->text = s->text;
-    setStatus(rc, CMPI_RC_OK);
-    return &copy->cmpi;
+    return cloneObject<StringObject>(
+        st, rc, [](auto& to, const auto& from) { to.text = from.text; });
 }
 
 const char* stringGetCharPtr(const CMPIString* st, CMPIStatus* rc)
