@@ -7,8 +7,12 @@ cd "$(dirname "$0")/.."
 tools/setup-deps.sh
 
 echo "== format check"
-git ls-files -- '*.h' '*.cpp' |
-    xargs clang-format --dry-run --Werror
+if git rev-parse --is-inside-work-tree >/dev/null 2>&1; then
+    git ls-files -z -- '*.h' '*.cpp'
+else
+    find . -path './build*' -prune -o \( -name '*.h' -o -name '*.cpp' \) \
+        -print0
+fi | xargs -0 clang-format --dry-run --Werror
 
 for preset in default asan tsan; do
     echo "== $preset build"
