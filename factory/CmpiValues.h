@@ -121,6 +121,14 @@ CMPIStatus setTypedElement(CMPIArray* array, CMPICount index, T value)
     return array->ft->setElementAt(array, index, &data, CmpiTypeOf<T>::type);
 }
 
+template <typename T>
+CMPIStatus returnTypedData(const CMPIResult* result, T value)
+{
+    CMPIValue data{};
+    CmpiTypeOf<T>::store(data, value);
+    return result->ft->returnData(result, &data, CmpiTypeOf<T>::type);
+}
+
 /** Characters of a broker string, or nullptr for a missing string. */
 inline const char* charsOf(const CMPIString* string, CMPIStatus* status)
 {

@@ -73,12 +73,8 @@ CMPIStatus ctxAddEntry(const CMPIContext* ctx, const char* name,
     {
         return errorStatus(CMPI_RC_ERR_INVALID_HANDLE);
     }
-    if (name == nullptr)
-    {
-        return errorStatus(CMPI_RC_ERR_INVALID_PARAMETER);
-    }
     Value v;
-    const CMPIrc rc = readArgument(value, type, v);
+    const CMPIrc rc = readNamedArgument(name, value, type, v);
     if (rc != CMPI_RC_OK)
     {
         return errorStatus(rc);

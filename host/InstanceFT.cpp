@@ -123,12 +123,8 @@ CMPIStatus instSetProperty(const CMPIInstance* inst, const char* name,
     {
         return errorStatus(CMPI_RC_ERR_FAILED);
     }
-    if (name == nullptr)
-    {
-        return errorStatus(CMPI_RC_ERR_INVALID_PARAMETER);
-    }
     Value v;
-    const CMPIrc rc = readArgument(value, type, v);
+    const CMPIrc rc = readNamedArgument(name, value, type, v);
     if (rc != CMPI_RC_OK)
     {
         return errorStatus(rc);

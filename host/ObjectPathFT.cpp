@@ -98,12 +98,8 @@ CMPIStatus opAddKey(CMPIObjectPath* op, const char* name,
     {
         return errorStatus(CMPI_RC_ERR_INVALID_HANDLE);
     }
-    if (name == nullptr)
-    {
-        return errorStatus(CMPI_RC_ERR_INVALID_PARAMETER);
-    }
     Value v;
-    const CMPIrc rc = readArgument(value, type, v);
+    const CMPIrc rc = readNamedArgument(name, value, type, v);
     if (rc != CMPI_RC_OK)
     {
         return errorStatus(rc);
@@ -120,17 +116,8 @@ CMPIData opGetKey(const CMPIObjectPath* op, const char* name, CMPIStatus* rc)
         setStatus(rc, CMPI_RC_ERR_INVALID_HANDLE);
         return nullData();
     }
-    const Value* v = name ? p->path.key(name) : nullptr;
-    if (v == nullptr)
-    {
-        setStatus(rc, name ? CMPI_RC_ERR_NO_SUCH_PROPERTY
-                           : CMPI_RC_ERR_INVALID_PARAMETER);
-        CMPIData d = nullData();
-        d.state |= CMPI_notFound;
-        return d;
-    }
-    setStatus(rc, CMPI_RC_OK);
-    return makeData(*p->broker, *v, CMPI_keyValue);
+    return lookupData(*p->broker, name ? p->path.key(name) : nullptr, name, rc,
+                      CMPI_keyValue);
 }
 
 CMPIData opGetKeyAt(const CMPIObjectPath* op, CMPICount index,

@@ -305,8 +305,15 @@ CMPIData makeData(BrokerState& broker, const Value& value,
     return d;
 }
 
+CMPIrc readNamedArgument(const char* name, const CMPIValue* value,
+                         CMPIType type, Value& out)
+{
+    return name == nullptr ? CMPI_RC_ERR_INVALID_PARAMETER
+                           : readArgument(value, type, out);
+}
+
 CMPIData lookupData(BrokerState& broker, const Value* found, const char* name,
-                    CMPIStatus* rc)
+                    CMPIStatus* rc, CMPIValueState extraState)
 {
     if (found == nullptr)
     {
@@ -317,7 +324,7 @@ CMPIData lookupData(BrokerState& broker, const Value* found, const char* name,
         return d;
     }
     setStatus(rc, CMPI_RC_OK);
-    return makeData(broker, *found);
+    return makeData(broker, *found, extraState);
 }
 
 CMPIData indexedData(BrokerState& broker, const NamedValues& values,

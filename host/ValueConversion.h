@@ -17,6 +17,11 @@ struct BrokerState;
 // value. Returns CMPI_RC_OK or the error to report.
 CMPIrc readArgument(const CMPIValue* value, CMPIType type, Value& out);
 
+// readArgument for the calls that store a value under a name (addArg,
+// addEntry, addKey, setProperty): a null name is an invalid parameter.
+CMPIrc readNamedArgument(const char* name, const CMPIValue* value,
+                         CMPIType type, Value& out);
+
 // Copies a CMPIData (as returned by getProperty and friends) into a Value.
 CMPIrc readData(const CMPIData& data, Value& out);
 
@@ -29,7 +34,7 @@ CMPIData makeData(BrokerState& broker, const Value& value,
 // value, or a null marked not found with CMPI_RC_ERR_NO_SUCH_PROPERTY
 // (CMPI_RC_ERR_INVALID_PARAMETER when no name was given).
 CMPIData lookupData(BrokerState& broker, const Value* found, const char* name,
-                    CMPIStatus* rc);
+                    CMPIStatus* rc, CMPIValueState extraState = CMPI_goodValue);
 
 // The answer to a lookup by position (getPropertyAt, getEntryAt,
 // getArgAt), handing out the name as a new string when asked for.

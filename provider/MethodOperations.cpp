@@ -3,6 +3,7 @@
 #include "SELProvider.h"
 #include "sdk/qxlib/include/Trace.h"
 
+#include <cstdint>
 #include <strings.h>
 
 namespace QX::SELComposite
@@ -47,9 +48,7 @@ CMPIStatus SEL_InvokeMethod(CMPIMethodMI*, const CMPIContext*,
         }
     }
     // The method's return value mirrors the status code.
-    CMPIValue returnValue{};
-    returnValue.uint32 = static_cast<CMPIUint32>(status.rc);
-    result->ft->returnData(result, &returnValue, CMPI_uint32);
+    returnTypedData(result, static_cast<std::uint32_t>(status.rc));
     result->ft->returnDone(result);
     markProviderExit(loggerSELProvider, function, unitFile, __LINE__);
     return status;
