@@ -89,6 +89,21 @@ TEST_F(BrokerFailures, RejectedDateTimeLeavesTheTimestampOut)
     EXPECT_NE(outcome.instances[1].property("MessageTimestamp"), nullptr);
 }
 
+TEST_F(BrokerFailures, FailedPropertyDoesNotStopTheOthers)
+{
+    install(selTree(1));
+    // The third property set on the log ("Caption") is refused.
+    broker().faults().fail(BrokerCall::SetProperty, FaultMode::FailStatus, 2,
+                           1);
+    const auto outcome = host().enumerateInstances(classPath("ZAN_MgmtHwLog"));
+    EXPECT_EQ(outcome.rc, CMPI_RC_OK);
+    ASSERT_EQ(outcome.instances.size(), 1u);
+    const host::Instance& log = outcome.instances[0];
+    EXPECT_EQ(log.property("Caption"), nullptr);
+    EXPECT_NE(log.property("Description"), nullptr);
+    EXPECT_EQ(log.propertyNames().size(), 18u);
+}
+
 TEST_F(BrokerFailures, FailingClassNameQueryIsReportedInTheStatus)
 {
     install(selTree(2));
