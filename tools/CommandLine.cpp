@@ -116,8 +116,9 @@ const char* usageText()
            "Name=\"IPMI SEL\"'\n"
            "(the namespace may be left out). --properties \"\" asks for no "
            "properties.\n"
-           "--library defaults to ../lib/libSELProvider.so beside the "
-           "executable; --config sets QX_PLATFORM_CONFIG.\n";
+           "--library defaults to the installed provider library, or to "
+           "../lib/libSELProvider.so beside the executable in a build "
+           "tree;\n--config sets QX_PLATFORM_CONFIG.\n";
 }
 
 Options parseCommandLine(const std::vector<std::string>& args)

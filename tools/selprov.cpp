@@ -21,19 +21,39 @@ constexpr int exitFailed = 1;
 constexpr int exitUsage = 2;
 constexpr int exitLoad = 3;
 
-std::string defaultLibrary()
+std::string executableDirectory()
 {
     std::vector<char> buf(PATH_MAX + 1);
     const ssize_t n = readlink("/proc/self/exe", buf.data(), buf.size() - 1);
     if (n <= 0)
     {
-        return "libSELProvider.so";
+        return ".";
     }
-    std::string exe(buf.data(), static_cast<std::size_t>(n));
+    const std::string exe(buf.data(), static_cast<std::size_t>(n));
     const auto slash = exe.rfind('/');
-    const std::string dir =
-        slash == std::string::npos ? "." : exe.substr(0, slash);
-    return dir + "/../lib/libSELProvider.so";
+    return slash == std::string::npos ? "." : exe.substr(0, slash);
+}
+
+// The provider library where the installation puts it (relative to this
+// executable's directory, or absolute), else where the build tree has it;
+// the installed location when neither exists, so that the load error
+// names it.
+std::string defaultLibrary()
+{
+    const std::string installed = SELPROV_INSTALLED_LIBRARY;
+    const std::string dir = executableDirectory();
+    const std::string installedPath =
+        !installed.empty() && installed.front() == '/' ? installed
+                                                       : dir + "/" + installed;
+    const std::string buildTreePath = dir + "/../lib/libSELProvider.so";
+    for (const std::string& candidate : {installedPath, buildTreePath})
+    {
+        if (access(candidate.c_str(), F_OK) == 0)
+        {
+            return candidate;
+        }
+    }
+    return installedPath;
 }
 
 host::ObjectPath targetPath(const selprov::Options& o)
