@@ -20,4 +20,8 @@ for preset in default asan tsan; do
     cmake --build --preset "$preset"
     echo "== $preset tests"
     ctest --preset "$preset" -j 2
+    if [[ $preset == default ]]; then
+        echo "== package"
+        tools/check-package.sh build
+    fi
 done
