@@ -13,20 +13,24 @@ prefix or absolute: a directory the object manager searches for providers \
 set(SELPROV_DATA_DIR "${CMAKE_INSTALL_DATADIR}/selprovider")
 set(SELPROV_DOC_DIR "${CMAKE_INSTALL_DATADIR}/doc/selprovider")
 
-# The installed library as selprov finds it by default: relative to the
-# directory of the selprov executable when both are under the prefix.
-if(IS_ABSOLUTE "${SELPROV_PROVIDER_DIR}" OR IS_ABSOLUTE "${CMAKE_INSTALL_BINDIR}")
+# The provider directory as seen from another installed directory: relative
+# to it when both are under the prefix (so the installation can be moved,
+# and the package installs under another prefix), absolute otherwise.
+function(selprov_provider_dir_from from_dir out_var)
   if(IS_ABSOLUTE "${SELPROV_PROVIDER_DIR}")
-    set(SELPROV_INSTALLED_LIBRARY "${SELPROV_PROVIDER_DIR}/libSELProvider.so")
+    set(${out_var} "${SELPROV_PROVIDER_DIR}" PARENT_SCOPE)
+  elseif(IS_ABSOLUTE "${from_dir}")
+    set(${out_var} "${CMAKE_INSTALL_PREFIX}/${SELPROV_PROVIDER_DIR}" PARENT_SCOPE)
   else()
-    set(SELPROV_INSTALLED_LIBRARY
-        "${CMAKE_INSTALL_PREFIX}/${SELPROV_PROVIDER_DIR}/libSELProvider.so")
+    file(RELATIVE_PATH relative "/prefix/${from_dir}"
+         "/prefix/${SELPROV_PROVIDER_DIR}")
+    set(${out_var} "${relative}" PARENT_SCOPE)
   endif()
-else()
-  file(RELATIVE_PATH selprov_bin_to_provider
-       "/prefix/${CMAKE_INSTALL_BINDIR}" "/prefix/${SELPROV_PROVIDER_DIR}")
-  set(SELPROV_INSTALLED_LIBRARY "${selprov_bin_to_provider}/libSELProvider.so")
-endif()
+endfunction()
+
+# The installed library as selprov finds it by default.
+selprov_provider_dir_from("${CMAKE_INSTALL_BINDIR}" selprov_provider_dir)
+set(SELPROV_INSTALLED_LIBRARY "${selprov_provider_dir}/libSELProvider.so")
 
 # Installed files and directories get the usual modes whatever the umask
 # of the build.
