@@ -1,0 +1,288 @@
+#include "IpmiSession.h"
+
+#include "IpmiLog.h"
+
+#include <algorithm>
+
+namespace QX::Ipmi
+{
+
+namespace
+{
+
+using Clock = std::chrono::steady_clock;
+
+std::int64_t ticks(Clock::time_point when)
+{
+    return std::chrono::duration_cast<std::chrono::nanoseconds>(
+               when.time_since_epoch())
+        .count();
+}
+
+const char* driverName(ipmi_driver_type_t driver)
+{
+    switch (driver)
+    {
+        case IPMI_DEVICE_KCS:
+            return "KCS";
+        case IPMI_DEVICE_SMIC:
+            return "SMIC";
+        case IPMI_DEVICE_BT:
+            return "BT";
+        case IPMI_DEVICE_SSIF:
+            return "SSIF";
+        case IPMI_DEVICE_OPENIPMI:
+            return "OpenIPMI driver";
+        case IPMI_DEVICE_SUNBMC:
+            return "Sun BMC driver";
+        case IPMI_DEVICE_INTELDCMI:
+            return "Intel DCMI";
+        default:
+            return "driver probed at first use";
+    }
+}
+
+} // namespace
+
+IpmiSession::IpmiSession(SessionParameters parameters) :
+    parameters_(std::move(parameters)),
+    reopenAfter_(parameters_.lan ? std::min<std::chrono::milliseconds>(
+                                       std::chrono::milliseconds(
+                                           parameters_.sessionTimeoutMs / 2),
+                                       std::chrono::seconds(15))
+                                 : std::chrono::milliseconds::max())
+{
+}
+
+std::string IpmiSession::peerName() const
+{
+    if (parameters_.lan)
+    {
+        return "LAN 2.0 " + parameters_.host;
+    }
+    return std::string("in-band (") +
+           driverName(context_ ? context_->driver() : parameters_.driver) + ")";
+}
+
+std::string IpmiSession::peerKey() const
+{
+    if (!parameters_.lan)
+    {
+        return "inband";
+    }
+    std::string key = "lan-" + parameters_.host;
+    for (char& c : key)
+    {
+        const bool plain = (c >= 'a' && c <= 'z') || (c >= 'A' && c <= 'Z') ||
+                           (c >= '0' && c <= '9') || c == '.' || c == '-';
+        if (!plain)
+        {
+            c = '_';
+        }
+    }
+    return key;
+}
+
+IpmiContext& IpmiSession::open()
+{
+    if (context_)
+    {
+        const Clock::time_point last{
+            std::chrono::nanoseconds(lastActivity_.load())};
+        if (Clock::now() - last < reopenAfter_)
+        {
+            return *context_;
+        }
+        // Idle long enough that the BMC, or FreeIPMI's own bookkeeping,
+        // may already count the session as dead: start a fresh one.
+        context_.reset();
+    }
+    try
+    {
+        context_.emplace(parameters_);
+    }
+    catch (const IpmiError&)
+    {
+        touch();
+        lost_ = true;
+        throw;
+    }
+    ++generation_;
+    touch();
+    // Routine re-opens after idle time are not worth a line; the first
+    // session and the first one after a failure are.
+    if (generation_.load() == 1 || lost_)
+    {
+        logLine(logLevelInfo, "IpmiSession::open", __LINE__,
+                std::string(lost_ ? "IPMI session opened again: "
+                                  : "IPMI session opened: ") +
+                    peerName());
+    }
+    lost_ = false;
+    return *context_;
+}
+
+void IpmiSession::touch()
+{
+    lastActivity_.store(ticks(Clock::now()));
+}
+
+template <typename Result, typename Work>
+Result IpmiSession::exchange(Work work)
+{
+    IpmiContext& context = open();
+    try
+    {
+        if constexpr (std::is_void_v<Result>)
+        {
+            work(context);
+            touch();
+        }
+        else
+        {
+            Result result = work(context);
+            touch();
+            return result;
+        }
+    }
+    catch (const IpmiError& error)
+    {
+        touch();
+        if (error.sessionLost())
+        {
+            context_.reset();
+            lost_ = true;
+        }
+        throw;
+    }
+}
+
+void IpmiSession::run(const std::function<void(IpmiContext&)>& work)
+{
+    exchange<void>(work);
+}
+
+SelInfo IpmiSession::getSelInfo()
+{
+    return exchange<SelInfo>(
+        [](IpmiContext& context)
+        {
+            FiidObject response(tmpl_cmd_get_sel_info_rs);
+            context.check(ipmi_cmd_get_sel_info(context.get(), response.get()),
+                          "ipmi_cmd_get_sel_info", response,
+                          IPMI_NET_FN_STORAGE_RQ);
+            SelInfo info;
+            info.entries =
+                static_cast<std::uint16_t>(response.field("entries"));
+            info.freeSpace =
+                static_cast<std::uint16_t>(response.field("free_space"));
+            info.mostRecentAddition = static_cast<std::uint32_t>(
+                response.field("most_recent_addition_timestamp"));
+            info.mostRecentErase = static_cast<std::uint32_t>(
+                response.field("most_recent_erase_timestamp"));
+            info.overflow = response.field("overflow_flag") != 0;
+            info.reserveSupported =
+                response.field("reserve_sel_command_supported") != 0;
+            return info;
+        });
+}
+
+std::uint16_t IpmiSession::reserveSel()
+{
+    return exchange<std::uint16_t>(
+        [](IpmiContext& context)
+        {
+            FiidObject response(tmpl_cmd_reserve_sel_rs);
+            context.check(ipmi_cmd_reserve_sel(context.get(), response.get()),
+                          "ipmi_cmd_reserve_sel", response,
+                          IPMI_NET_FN_STORAGE_RQ);
+            return static_cast<std::uint16_t>(response.field("reservation_id"));
+        });
+}
+
+SelEntry IpmiSession::getSelEntry(std::uint16_t reservationId,
+                                  std::uint16_t recordId)
+{
+    return exchange<SelEntry>(
+        [reservationId, recordId](IpmiContext& context)
+        {
+            FiidObject response(tmpl_cmd_get_sel_entry_rs);
+            context.check(
+                ipmi_cmd_get_sel_entry(
+                    context.get(), reservationId, recordId, 0,
+                    IPMI_SEL_READ_ENTIRE_RECORD_BYTES_TO_READ, response.get()),
+                "ipmi_cmd_get_sel_entry", response, IPMI_NET_FN_STORAGE_RQ);
+            SelEntry entry;
+            entry.nextRecordId =
+                static_cast<std::uint16_t>(response.field("next_record_id"));
+            response.data("record_data", entry.data);
+            return entry;
+        });
+}
+
+void IpmiSession::initiateSelErase(std::uint16_t reservationId)
+{
+    exchange<void>(
+        [reservationId](IpmiContext& context)
+        {
+            FiidObject response(tmpl_cmd_clear_sel_rs);
+            context.check(
+                ipmi_cmd_clear_sel(context.get(), reservationId,
+                                   IPMI_SEL_CLEAR_OPERATION_INITIATE_ERASE,
+                                   response.get()),
+                "ipmi_cmd_clear_sel", response, IPMI_NET_FN_STORAGE_RQ);
+        });
+}
+
+bool IpmiSession::selEraseCompleted(std::uint16_t reservationId)
+{
+    return exchange<bool>(
+        [reservationId](IpmiContext& context)
+        {
+            FiidObject response(tmpl_cmd_clear_sel_rs);
+            context.check(
+                ipmi_cmd_clear_sel(context.get(), reservationId,
+                                   IPMI_SEL_CLEAR_OPERATION_GET_ERASURE_STATUS,
+                                   response.get()),
+                "ipmi_cmd_clear_sel", response, IPMI_NET_FN_STORAGE_RQ);
+            return response.field("erasure_progress") ==
+                   IPMI_SEL_CLEAR_ERASE_COMPLETED;
+        });
+}
+
+std::optional<std::uint8_t> IpmiSession::getSystemRestartCause()
+{
+    return exchange<std::optional<std::uint8_t>>(
+        [](IpmiContext& context) -> std::optional<std::uint8_t>
+        {
+            FiidObject response(tmpl_cmd_get_system_restart_cause_rs);
+            try
+            {
+                context.check(ipmi_cmd_get_system_restart_cause(context.get(),
+                                                                response.get()),
+                              "ipmi_cmd_get_system_restart_cause", response,
+                              IPMI_NET_FN_CHASSIS_RQ);
+            }
+            catch (const IpmiError& error)
+            {
+                if (error.completionCode() == completionInvalidCommand)
+                {
+                    return std::nullopt;
+                }
+                throw;
+            }
+            return static_cast<std::uint8_t>(response.field("restart_cause"));
+        });
+}
+
+std::uint64_t IpmiSession::sessionGeneration() const
+{
+    return generation_.load();
+}
+
+Clock::time_point IpmiSession::lastActivity() const
+{
+    return Clock::time_point(std::chrono::nanoseconds(lastActivity_.load()));
+}
+
+} // namespace QX::Ipmi
