@@ -253,7 +253,7 @@ class BmcFaultTest : public BmcTest
                 return std::make_pair(outcome,
                                       std::chrono::steady_clock::now() - began);
             });
-        std::this_thread::sleep_for(std::chrono::milliseconds(60));
+        std::this_thread::sleep_for(std::chrono::milliseconds(200));
         const auto faultAt = std::chrono::steady_clock::now();
         fault();
         const auto [outcome, took] = request.get();
@@ -280,7 +280,7 @@ TEST_F(BmcFaultTest, FrozenBmcEndsTheRequestWithinTheTimeout)
 TEST_F(BmcFaultTest, KilledBmcEndsTheRequestAndARestartedOneServes)
 {
     // A dead simulator may also be noticed by the socket ("system error").
-    expectFailedRequest([this] { bmc().kill(); }, "ipmi_cmd_get_sel_entry");
+    expectFailedRequest([this] { bmc().kill(); }, "ipmi_cmd_");
     bmc().restart();
     EXPECT_EQ(enumerate("ZAN_MgmtHwLogEntry").instances.size(), records);
 }
