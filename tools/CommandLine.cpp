@@ -101,7 +101,7 @@ void setOnce(std::optional<std::string>& slot, std::string value,
 const char* usageText()
 {
     return "usage: selprov [--library PATH] [--config FILE] [--namespace NS] "
-           "[--json] COMMAND ...\n"
+           "[--json] [--timing] COMMAND ...\n"
            "commands:\n"
            "  enumerate-names CLASS\n"
            "  enumerate CLASS [--properties P1,P2]\n"
@@ -117,7 +117,8 @@ const char* usageText()
            "(the namespace may be left out). --properties \"\" asks for no "
            "properties.\n"
            "--library defaults to ../lib/libSELProvider.so beside the "
-           "executable; --config sets QX_PLATFORM_CONFIG.\n";
+           "executable; --config sets QX_PLATFORM_CONFIG; --timing writes "
+           "each request's time to standard error.\n";
 }
 
 Options parseCommandLine(const std::vector<std::string>& args)
@@ -143,6 +144,11 @@ Options parseCommandLine(const std::vector<std::string>& args)
         {
             in.next("--json");
             o.json = true;
+        }
+        else if (in.peek() == "--timing")
+        {
+            in.next("--timing");
+            o.timing = true;
         }
         else if (in.peek() == "--help" || in.peek() == "-h")
         {
