@@ -4,6 +4,11 @@
 #include "Instrumentation.h"
 #include "platform/FakeBmc.h"
 
+#include <atomic>
+#include <chrono>
+#include <future>
+#include <thread>
+
 #include <gtest/gtest.h>
 
 using namespace QX;
@@ -300,6 +305,88 @@ TEST_F(IpmiSourceTest, UnreachableBmcMakesTheCursorThrow)
     Instrumentation again(source);
     again.selectNode(ManagementController);
     EXPECT_TRUE(again);
+}
+
+TEST_F(IpmiSourceTest, ConcurrentRequestsTakeTurnsOnTheBmc)
+{
+    initial = {selRecord(1), selRecord(2)};
+    make();
+    const auto walk = [this]
+    {
+        std::size_t entries = 0;
+        for (int i = 0; i < 50; ++i)
+        {
+            Instrumentation cursor(source);
+            cursor.selectNode(EventLogEntry);
+            for (; cursor; ++cursor)
+            {
+                ++entries;
+            }
+        }
+        return entries;
+    };
+    auto other = std::async(std::launch::async, walk);
+    EXPECT_EQ(walk(), 100u);
+    EXPECT_EQ(other.get(), 100u);
+}
+
+// A BMC whose Get SEL Info hangs until released, making no progress.
+class HangingBmc : public FakeBmc
+{
+  public:
+    SelInfo getSelInfo() override
+    {
+        if (hang.load())
+        {
+            entered.store(true);
+            while (hang.load())
+            {
+                std::this_thread::sleep_for(std::chrono::milliseconds(5));
+            }
+        }
+        return FakeBmc::getSelInfo();
+    }
+    std::chrono::steady_clock::time_point lastActivity() const override
+    {
+        return since;
+    }
+
+    std::atomic<bool> hang{false};
+    std::atomic<bool> entered{false};
+    const std::chrono::steady_clock::time_point since =
+        std::chrono::steady_clock::now();
+};
+
+TEST_F(IpmiSourceTest, RequestBehindAStuckOneGivesUpAfterTheTimeout)
+{
+    auto fake = std::make_unique<HangingBmc>();
+    HangingBmc& hanging = *fake;
+    Settings settings;
+    settings.timeoutMs = 200;
+    source = std::make_shared<IpmiSource>(std::move(fake),
+                                          std::make_unique<CountingDescriber>(),
+                                          settings, "BMC");
+    hanging.hang.store(true);
+    auto stuck = std::async(std::launch::async, [this] { source->snapshot(); });
+    while (!hanging.entered.load())
+    {
+        std::this_thread::sleep_for(std::chrono::milliseconds(1));
+    }
+    const auto began = std::chrono::steady_clock::now();
+    try
+    {
+        source->snapshot();
+        ADD_FAILURE() << "no error";
+    }
+    catch (const IpmiError& error)
+    {
+        EXPECT_EQ(error.category(), ErrorCategory::Busy);
+    }
+    EXPECT_LT(std::chrono::steady_clock::now() - began,
+              std::chrono::milliseconds(2000));
+    hanging.hang.store(false);
+    stuck.get();
+    EXPECT_NO_THROW(source->snapshot());
 }
 
 TEST_F(IpmiSourceTest, MonitoringRegistrationsAreKept)
