@@ -222,7 +222,7 @@ class BmcFaultTest : public BmcTest
 {
   protected:
     static constexpr unsigned timeoutMs = 1500;
-    static constexpr unsigned records = 3000;
+    static constexpr unsigned records = 2000;
 
     void SetUp() override
     {
