@@ -3,6 +3,10 @@
 #include "IpmiLog.h"
 
 #include <algorithm>
+#include <condition_variable>
+#include <exception>
+#include <mutex>
+#include <thread>
 
 namespace QX::Ipmi
 {
@@ -50,9 +54,18 @@ IpmiSession::IpmiSession(SessionParameters parameters) :
                                        std::chrono::milliseconds(
                                            parameters_.sessionTimeoutMs / 2),
                                        std::chrono::seconds(15))
-                                 : std::chrono::milliseconds::max())
+                                 : std::chrono::milliseconds::max()),
+    guarded_(!parameters_.lan || parameters_.guardExchanges)
 {
 }
+
+struct IpmiSession::PendingCall
+{
+    std::mutex mutex;
+    std::condition_variable finished;
+    bool done = false;
+    std::exception_ptr error;
+};
 
 std::string IpmiSession::peerName() const
 {
@@ -83,15 +96,26 @@ std::string IpmiSession::peerKey() const
     return key;
 }
 
-IpmiContext& IpmiSession::open()
+std::shared_ptr<IpmiContext> IpmiSession::open()
 {
+    if (abandoned_)
+    {
+        const std::lock_guard lock(abandoned_->mutex);
+        if (!abandoned_->done)
+        {
+            throw IpmiError("IPMI exchange", ErrorCategory::Busy,
+                            "the driver has not yet returned from an "
+                            "exchange given up on after the timeout");
+        }
+    }
+    abandoned_.reset();
     if (context_)
     {
         const Clock::time_point last{
             std::chrono::nanoseconds(lastActivity_.load())};
         if (Clock::now() - last < reopenAfter_)
         {
-            return *context_;
+            return context_;
         }
         // Idle long enough that the BMC, or FreeIPMI's own bookkeeping,
         // may already count the session as dead: start a fresh one.
@@ -99,7 +123,7 @@ IpmiContext& IpmiSession::open()
     }
     try
     {
-        context_.emplace(parameters_);
+        context_ = std::make_shared<IpmiContext>(parameters_);
     }
     catch (const IpmiError&)
     {
@@ -119,7 +143,7 @@ IpmiContext& IpmiSession::open()
                     peerName());
     }
     lost_ = false;
-    return *context_;
+    return context_;
 }
 
 void IpmiSession::touch()
@@ -128,19 +152,92 @@ void IpmiSession::touch()
 }
 
 template <typename Result, typename Work>
+Result IpmiSession::guardedCall(const std::shared_ptr<IpmiContext>& context,
+                                Work work)
+{
+    // The helper owns what it touches, so it may outlive this call (and
+    // this session) when the driver does not return in time.
+    auto call = std::make_shared<PendingCall>();
+    using Stored = std::conditional_t<std::is_void_v<Result>, bool, Result>;
+    auto result = std::make_shared<std::optional<Stored>>();
+    std::thread(
+        [call, context, result, work]() mutable
+        {
+            try
+            {
+                if constexpr (std::is_void_v<Result>)
+                {
+                    work(*context);
+                    result->emplace(true);
+                }
+                else
+                {
+                    result->emplace(work(*context));
+                }
+            }
+            catch (...)
+            {
+                call->error = std::current_exception();
+            }
+            {
+                const std::lock_guard lock(call->mutex);
+                call->done = true;
+            }
+            call->finished.notify_all();
+        })
+        .detach();
+
+    const auto timeout = std::chrono::milliseconds(
+        parameters_.guardTimeoutMs != 0 ? parameters_.guardTimeoutMs
+                                        : parameters_.sessionTimeoutMs);
+    std::unique_lock lock(call->mutex);
+    if (!call->finished.wait_for(lock, timeout, [&call] { return call->done; }))
+    {
+        lock.unlock();
+        abandoned_ = call;
+        throw IpmiError("IPMI exchange", ErrorCategory::Timeout,
+                        "no answer from the driver within " +
+                            std::to_string(timeout.count()) + " ms");
+    }
+    if (call->error)
+    {
+        std::rethrow_exception(call->error);
+    }
+    if constexpr (!std::is_void_v<Result>)
+    {
+        return std::move(**result);
+    }
+}
+
+template <typename Result, typename Work>
 Result IpmiSession::exchange(Work work)
 {
-    IpmiContext& context = open();
+    const std::shared_ptr<IpmiContext> context = open();
     try
     {
+        if (guarded_)
+        {
+            if constexpr (std::is_void_v<Result>)
+            {
+                guardedCall<void>(context, work);
+                touch();
+                return;
+            }
+            else
+            {
+                Result result = guardedCall<Result>(context, work);
+                touch();
+                return result;
+            }
+        }
         if constexpr (std::is_void_v<Result>)
         {
-            work(context);
+            work(*context);
             touch();
         }
         else
         {
-            Result result = work(context);
+            Result result = work(*context);
             touch();
             return result;
         }
@@ -159,7 +256,25 @@ Result IpmiSession::exchange(Work work)
 
 void IpmiSession::run(const std::function<void(IpmiContext&)>& work)
 {
-    exchange<void>(work);
+    // Not guarded: the work uses its caller's state, which must not be
+    // left to a helper thread. The SDR cache code it runs makes single
+    // driver calls bounded by the driver.
+    const std::shared_ptr<IpmiContext> context = open();
+    try
+    {
+        work(*context);
+        touch();
+    }
+    catch (const IpmiError& error)
+    {
+        touch();
+        if (error.sessionLost())
+        {
+            context_.reset();
+            lost_ = true;
+        }
+        throw;
+    }
 }
 
 SelInfo IpmiSession::getSelInfo()

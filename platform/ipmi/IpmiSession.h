@@ -6,6 +6,7 @@
 #include <atomic>
 #include <chrono>
 #include <functional>
+#include <memory>
 #include <optional>
 #include <string>
 
@@ -23,6 +24,13 @@ namespace QX::Ipmi
  * session whose exchange timed out or failed at the session level is
  * closed: the next exchange opens a new one. Nothing is retried here; a
  * failure throws IpmiError at once.
+ *
+ * In-band drivers wait on the BMC with timeouts of their own, longer than
+ * the configured one. So in-band exchanges run on a helper thread that
+ * shares the context, and the caller waits at most the timeout: then it
+ * throws (Timeout) and leaves the context to the helper. Until the driver
+ * returns, further exchanges fail at once (Busy); afterwards a new context
+ * is opened.
  *
  * Not thread-safe: callers serialize every member except lastActivity()
  * and sessionGeneration(), which any thread may read.
@@ -59,14 +67,20 @@ class IpmiSession : public BmcCommands
     std::string peerKey() const;
 
   private:
-    IpmiContext& open();
+    struct PendingCall;
+
+    std::shared_ptr<IpmiContext> open();
     template <typename Result, typename Work>
     Result exchange(Work work);
+    template <typename Result, typename Work>
+    Result guardedCall(const std::shared_ptr<IpmiContext>& context, Work work);
     void touch();
 
     SessionParameters parameters_;
     std::chrono::milliseconds reopenAfter_;
-    std::optional<IpmiContext> context_;
+    bool guarded_;
+    std::shared_ptr<IpmiContext> context_;
+    std::shared_ptr<PendingCall> abandoned_; // still inside the driver
     bool lost_ = false; // the last session ended in a failure
     std::atomic<std::uint64_t> generation_{0};
     std::atomic<std::int64_t> lastActivity_{0}; // steady clock, ns

@@ -135,4 +135,55 @@ TEST_F(SessionTest, FrozenBmcIsATimeoutWithinTheTimeoutAndThenRecovers)
     EXPECT_EQ(session.sessionGeneration(), 2u);
 }
 
+TEST_F(SessionTest, GuardedExchangeGivesUpAtItsOwnTimeout)
+{
+    // As in-band: the helper thread may wait on far longer than the caller.
+    SessionParameters guarded = parameters(5000);
+    guarded.guardExchanges = true;
+    guarded.guardTimeoutMs = 400;
+    IpmiSession session(guarded);
+    EXPECT_EQ(session.getSelInfo().entries, 0u);
+
+    bmc->freeze();
+    const auto began = std::chrono::steady_clock::now();
+    try
+    {
+        session.getSelInfo();
+        ADD_FAILURE() << "no error";
+    }
+    catch (const IpmiError& error)
+    {
+        EXPECT_EQ(error.category(), ErrorCategory::Timeout) << error.what();
+    }
+    EXPECT_LT(std::chrono::steady_clock::now() - began,
+              std::chrono::milliseconds(1500));
+    // The helper is still inside FreeIPMI: no second exchange meanwhile.
+    try
+    {
+        session.getSelInfo();
+        ADD_FAILURE() << "no error";
+    }
+    catch (const IpmiError& error)
+    {
+        EXPECT_EQ(error.category(), ErrorCategory::Busy) << error.what();
+    }
+
+    bmc->thaw();
+    bool served = false;
+    for (int attempt = 0; attempt < 200 && !served; ++attempt)
+    {
+        try
+        {
+            served = session.getSelInfo().entries == 0;
+        }
+        catch (const IpmiError& error)
+        {
+            ASSERT_EQ(error.category(), ErrorCategory::Busy) << error.what();
+            std::this_thread::sleep_for(std::chrono::milliseconds(50));
+        }
+    }
+    EXPECT_TRUE(served);
+    EXPECT_EQ(session.sessionGeneration(), 2u);
+}
+
 } // namespace
