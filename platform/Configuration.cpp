@@ -3,8 +3,9 @@
  * blank lines and lines starting with '#' are ignored, blanks around keys
  * and values are dropped, a later setting of a key replaces an earlier one.
  *
- *   source         = memory         (the only source so far)
+ *   source         = memory | ipmi
  *   memory.fixture = PATH           (empty: the built-in sample SEL)
+ *   ipmi.*         = ...            (the BMC; see README.md)
  *   log.sink       = syslog | stderr | none | file:PATH
  *   log.level      = N              (N >= 0; 0 disables the log channel)
  *   trace.level    = N              (N >= 0; 0 disables the trace channel)
@@ -117,15 +118,18 @@ Configuration parseConfiguration(const std::string& text,
         const std::size_t equals = line.find('=');
         if (equals == std::string::npos)
         {
-            at.fail("expected key = value, found \"" + line + "\"");
+            // A malformed password line must not end up in a log.
+            at.fail(line.find("password") == std::string::npos
+                        ? "expected key = value, found \"" + line + "\""
+                        : std::string("expected key = value"));
         }
         const std::string key = trim(line.substr(0, equals));
         const std::string value = trim(line.substr(equals + 1));
         if (key == "source")
         {
-            if (value != "memory")
+            if (value != "memory" && value != "ipmi")
             {
-                at.fail("source must be one of: memory (not \"" + value +
+                at.fail("source must be one of: memory, ipmi (not \"" + value +
                         "\")");
             }
             configuration.source = value;
@@ -133,6 +137,15 @@ Configuration parseConfiguration(const std::string& text,
         else if (key == "memory.fixture")
         {
             configuration.fixtureFile = value;
+        }
+        else if (Ipmi::isSettingKey(key))
+        {
+            const std::string problem =
+                Ipmi::applySetting(configuration.ipmi, key, value);
+            if (!problem.empty())
+            {
+                at.fail(problem);
+            }
         }
         else if (key == "log.sink")
         {
@@ -168,13 +181,18 @@ Configuration loadConfiguration()
     const char* named = std::getenv(configurationPathVariable);
     if (named != nullptr && *named != '\0')
     {
-        return parseConfiguration(readWholeFile(named), named);
+        Configuration configuration =
+            parseConfiguration(readWholeFile(named), named);
+        configuration.file = named;
+        return configuration;
     }
     std::error_code error;
     if (std::filesystem::exists(defaultConfigurationPath, error))
     {
-        return parseConfiguration(readWholeFile(defaultConfigurationPath),
-                                  defaultConfigurationPath);
+        Configuration configuration = parseConfiguration(
+            readWholeFile(defaultConfigurationPath), defaultConfigurationPath);
+        configuration.file = defaultConfigurationPath;
+        return configuration;
     }
     return Configuration{};
 }

@@ -3,6 +3,7 @@
 #include "CVLogger.h"
 #include "Fixture.h"
 #include "MemorySource.h"
+#include "ipmi/IpmiSourceFactory.h"
 
 #include <iostream>
 #include <mutex>
@@ -67,6 +68,10 @@ void configureLogger(const Configuration& configuration)
 std::shared_ptr<InstrumentationSource>
 makeSource(const Configuration& configuration)
 {
+    if (configuration.source == "ipmi")
+    {
+        return Ipmi::makeIpmiSource(configuration.ipmi, configuration.file);
+    }
     if (configuration.fixtureFile.empty())
     {
         std::istringstream sample(builtinSampleFixture());

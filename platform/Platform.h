@@ -1,6 +1,7 @@
 #pragma once
 
 #include "InstrumentationSource.h"
+#include "ipmi/IpmiSettings.h"
 
 #include <memory>
 #include <string>
@@ -17,9 +18,13 @@ constexpr const char* configurationPathVariable = "QX_PLATFORM_CONFIG";
 struct Configuration
 {
     /** "memory": the in-memory source, from fixtureFile or, when that is
-     *  empty, the built-in sample SEL. */
+     *  empty, the built-in sample SEL; "ipmi": the BMC, with the ipmi
+     *  settings. */
     std::string source = "memory";
     std::string fixtureFile;
+    Ipmi::Settings ipmi;
+    /** The file these settings were read from; empty for the defaults. */
+    std::string file;
     /** Logger: "syslog", "stderr", "none" or "file:PATH". */
     std::string logSink = "syslog";
     /** Lowest level written on the log channel; 0 disables the channel. */

@@ -101,7 +101,7 @@ void setOnce(std::optional<std::string>& slot, std::string value,
 const char* usageText()
 {
     return "usage: selprov [--library PATH] [--config FILE] [--namespace NS] "
-           "[--json] COMMAND ...\n"
+           "[--json] [--timing] COMMAND ...\n"
            "commands:\n"
            "  enumerate-names CLASS\n"
            "  enumerate CLASS [--properties P1,P2]\n"
@@ -118,7 +118,8 @@ const char* usageText()
            "properties.\n"
            "--library defaults to the installed provider library, or to "
            "../lib/libSELProvider.so beside the executable in a build "
-           "tree;\n--config sets QX_PLATFORM_CONFIG.\n";
+           "tree;\n--config sets QX_PLATFORM_CONFIG; --timing writes each "
+           "request's time to standard error.\n";
 }
 
 Options parseCommandLine(const std::vector<std::string>& args)
@@ -144,6 +145,11 @@ Options parseCommandLine(const std::vector<std::string>& args)
         {
             in.next("--json");
             o.json = true;
+        }
+        else if (in.peek() == "--timing")
+        {
+            in.next("--timing");
+            o.timing = true;
         }
         else if (in.peek() == "--help" || in.peek() == "-h")
         {

@@ -32,6 +32,7 @@ struct Options
     std::optional<std::string> config;
     std::string nameSpace = "root/zanqx";
     bool json = false;
+    bool timing = false; // write each request's time to standard error
     Command command = Command::Help;
     std::string target; // class name or object path
     std::string method; // invoke

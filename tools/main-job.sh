@@ -1,32 +1,80 @@
 #!/usr/bin/env bash
 # Builds the provider and runs it as an object manager would, through its
-# exported factories, on the built-in sample SEL: enumerate the log and its
-# entries, get one entry by its path, clear the log and look again.
+# exported factories, against a BMC: OpenIPMI's BMC simulator on 127.0.0.1,
+# reached over IPMI 2.0 LAN (RMCP+) and seeded with the sample SEL's
+# records. Enumerate the log and its entries, get one entry by its path,
+# clear the log and look again. The simulator is stopped by its PID at the
+# end, also when a step fails.
 set -euo pipefail
 cd "$(dirname "$0")/.."
 
 tools/setup-deps.sh
 mkdir -p build
-if ! { cmake --preset default && cmake --build --preset default --target SELProvider selprov; } \
+if ! { cmake --preset default &&
+       cmake --build --preset default --target SELProvider selprov bmcsim_tool; } \
         >build/main-job-build.log 2>&1; then
     cat build/main-job-build.log
     exit 1
 fi
 
-selprov=build/bin/selprov
+bmcsim=build/bin/bmcsim
+bench=$(mktemp -d /tmp/selprov-bmc.XXXXXX)
+stop_simulator() {
+    "$bmcsim" stop --dir "$bench" || true
+    rm -rf "$bench"
+}
+trap stop_simulator EXIT
+
+# The simulator: a free UDP port, the project's lan.conf and emulator file,
+# the sample SEL's 24 records, SEL clock set to now.
+simulator=$("$bmcsim" start --dir "$bench" --sample --max-records 64)
+host=$(sed -n 's/^host=//p' <<<"$simulator")
+echo "BMC simulator: $host (pid $(sed -n 's/^pid=//p' <<<"$simulator"))"
+
+# The platform configuration: the IPMI source over LAN 2.0. The password
+# sits in its own file, readable by its owner only.
+umask 077
+printf 'password\n' >"$bench/bmc.password"
+cat >"$bench/platform.conf" <<EOF
+source = ipmi
+ipmi.interface = lan
+ipmi.host = $host
+ipmi.user = admin
+ipmi.password-file = $bench/bmc.password
+ipmi.privilege = admin
+ipmi.cipher-suite = 3
+ipmi.workarounds = opensesspriv
+ipmi.timeout = 5000
+ipmi.state-directory = $bench/platform-state
+log.sink = stderr
+EOF
+
+selprov=(build/bin/selprov --config "$bench/platform.conf")
 run() {
     echo
     echo "\$ selprov $*"
-    "$selprov" "$@"
+    "${selprov[@]}" "$@"
 }
 
 run enumerate-names ZAN_MgmtHwLog
 run enumerate ZAN_MgmtHwLog
 run enumerate ZAN_MgmtHwLogEntry --properties RecordID,MessageTimestamp,Description,RecordData
-entry=$("$selprov" enumerate-names ZAN_MgmtHwLogEntry | sed -n 5p)
+entry=$("${selprov[@]}" enumerate-names ZAN_MgmtHwLogEntry | sed -n 5p)
 run get "$entry"
 # One process, so the cleared log is what the second request sees.
 echo
 echo "\$ selprov batch  (clear-log, then enumerate-names ZAN_MgmtHwLogEntry)"
 printf 'clear-log\nenumerate-names ZAN_MgmtHwLogEntry\nenumerate ZAN_MgmtHwLog --properties CurrentNumberOfRecords\n' |
-    "$selprov" batch
+    "${selprov[@]}" batch
+echo
+echo "\$ ipmitool sel info  (the BMC's own view after ClearLog)"
+ipmitool -I lanplus -H 127.0.0.1 -p "${host##*:}" -U admin -P password -C 3 \
+    sel info | grep -E '^(Entries|Last Del Time)'
+
+# The in-memory sample SEL needs no BMC: a configuration without a source
+# (or source = memory) uses it.
+echo
+echo "\$ selprov --config memory.conf enumerate ZAN_MgmtHwLog --properties Name,CurrentNumberOfRecords"
+printf 'source = memory\n' >"$bench/memory.conf"
+build/bin/selprov --config "$bench/memory.conf" \
+    enumerate ZAN_MgmtHwLog --properties Name,CurrentNumberOfRecords

@@ -6,9 +6,11 @@
 #include "StatusText.h"
 
 #include <cerrno>
+#include <chrono>
 #include <climits>
 #include <cstdlib>
 #include <cstring>
+#include <iomanip>
 #include <iostream>
 #include <string>
 #include <unistd.h>
@@ -127,6 +129,23 @@ void printReturnValue(const selprov::Options& o, const host::Outcome& out)
     }
 }
 
+// Calls the provider; with --timing, writes how long the call took (the
+// provider's work and the broker's, without printing) to standard error.
+template <typename Call>
+host::Outcome timed(const selprov::Options& o, Call call)
+{
+    const auto began = std::chrono::steady_clock::now();
+    host::Outcome out = call();
+    if (o.timing)
+    {
+        const std::chrono::duration<double, std::milli> took =
+            std::chrono::steady_clock::now() - began;
+        std::cerr << "selprov: request took " << std::fixed
+                  << std::setprecision(3) << took.count() << " ms\n";
+    }
+    return out;
+}
+
 // Runs the command; returns the operation's outcome (already printed when
 // it succeeded).
 host::Outcome run(const selprov::Options& o, host::Host& h)
@@ -136,23 +155,35 @@ host::Outcome run(const selprov::Options& o, host::Host& h)
     switch (o.command)
     {
         case Command::EnumerateNames:
-            out = h.enumerateInstanceNames(classPath(o, o.target));
+            out = timed(
+                o, [&]
+                { return h.enumerateInstanceNames(classPath(o, o.target)); });
             if (out.rc == CMPI_RC_OK)
             {
                 printPaths(o, out);
             }
             break;
         case Command::Enumerate:
-            out = h.enumerateInstances(classPath(o, o.target),
-                                       o.properties ? &*o.properties : nullptr);
+            out = timed(o,
+                        [&]
+                        {
+                            return h.enumerateInstances(
+                                classPath(o, o.target),
+                                o.properties ? &*o.properties : nullptr);
+                        });
             if (out.rc == CMPI_RC_OK)
             {
                 printInstances(o, out);
             }
             break;
         case Command::Get:
-            out = h.getInstance(targetPath(o),
-                                o.properties ? &*o.properties : nullptr);
+            out = timed(o,
+                        [&]
+                        {
+                            return h.getInstance(targetPath(o),
+                                                 o.properties ? &*o.properties
+                                                              : nullptr);
+                        });
             if (out.rc == CMPI_RC_OK)
             {
                 printInstances(o, out);
@@ -166,9 +197,14 @@ host::Outcome run(const selprov::Options& o, host::Host& h)
             {
                 return names;
             }
-            out = h.invokeMethod(names.paths.empty() ? logClass
-                                                     : names.paths.front(),
-                                 "ClearLog");
+            out = timed(o,
+                        [&]
+                        {
+                            return h.invokeMethod(names.paths.empty()
+                                                      ? logClass
+                                                      : names.paths.front(),
+                                                  "ClearLog");
+                        });
             if (out.rc == CMPI_RC_OK)
             {
                 printReturnValue(o, out);

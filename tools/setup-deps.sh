@@ -3,9 +3,12 @@
 # apt-get entirely when they are already there.
 set -euo pipefail
 
+# FreeIPMI is the platform's IPMI library; OpenIPMI's BMC simulator
+# (ipmi_sim) and ipmitool serve the tests, the main job and the benchmark.
 packages=(cmake ninja-build g++ pkg-config googletest libgtest-dev
           libgmock-dev libbenchmark-dev clang-format
-          dpkg-dev file lintian)
+          dpkg-dev file lintian
+          libfreeipmi-dev freeipmi-tools openipmi ipmitool)
 
 missing=()
 for package in "${packages[@]}"; do

@@ -137,6 +137,25 @@ TEST_F(Selprov, JsonOutputIsStructured)
     EXPECT_NE(json.output.find("\"Node\": 1"), std::string::npos);
 }
 
+TEST_F(Selprov, TimingWritesEachRequestsTimeToStandardError)
+{
+    const CommandResult batch =
+        run("printf 'enumerate-names ZAN_MgmtHwLog\\nenumerate-names "
+            "ZAN_MgmtHwLog\\n' | { " +
+                selprov() + "--timing batch >/dev/null; }",
+            true);
+    EXPECT_EQ(batch.exitCode, 0);
+    std::size_t lines = 0;
+    for (std::size_t at = batch.output.find("selprov: request took ");
+         at != std::string::npos;
+         at = batch.output.find("selprov: request took ", at + 1))
+    {
+        ++lines;
+    }
+    EXPECT_EQ(lines, 2u) << batch.output;
+    EXPECT_NE(batch.output.find(" ms\n"), std::string::npos);
+}
+
 TEST_F(Selprov, FailedRequestPrintsTheCmpiStatus)
 {
     const CommandResult failed =

@@ -123,8 +123,9 @@ TEST(Configuration, ParsesEveryKey)
 
 TEST(Configuration, RejectsBadLines)
 {
-    EXPECT_EQ(configurationError("source = ipmi\n"),
-              "platform.conf:1: source must be one of: memory (not \"ipmi\")");
+    EXPECT_EQ(
+        configurationError("source = bmc\n"),
+        "platform.conf:1: source must be one of: memory, ipmi (not \"bmc\")");
     EXPECT_EQ(configurationError("\ncolour = blue\n"),
               "platform.conf:2: unknown key \"colour\"");
     EXPECT_EQ(configurationError("log.level\n"),
@@ -209,7 +210,7 @@ TEST_F(PlatformTest, EmptyFixtureSettingUsesTheBuiltInSample)
 
 TEST_F(PlatformTest, BrokenConfigurationFailsEveryCursor)
 {
-    const TempFile configuration("source = ipmi\n");
+    const TempFile configuration("source = bmc\n");
     environment_.set(Platform::configurationPathVariable, configuration.path());
     Platform::overrideSource(nullptr);
     ::testing::internal::CaptureStderr();
@@ -221,7 +222,8 @@ TEST_F(PlatformTest, BrokenConfigurationFailsEveryCursor)
     }
     catch (const std::exception& error)
     {
-        EXPECT_THAT(error.what(), HasSubstr("source must be one of: memory"));
+        EXPECT_THAT(error.what(),
+                    HasSubstr("source must be one of: memory, ipmi"));
     }
     const std::string written = ::testing::internal::GetCapturedStderr();
     EXPECT_THAT(written, HasSubstr("source must be one of: memory"));

@@ -1,0 +1,162 @@
+#!/usr/bin/env bash
+# Times the provider on OpenIPMI's BMC simulator against FreeIPMI's ipmi-sel
+# and ipmitool, on the same simulated SEL in the same run, and prints each
+# result as a ratio to ipmi-sel. Run by hand (not in CI), after a build:
+#
+#   cmake --preset default && cmake --build --preset default
+#   bench/ipmi-bench.sh [RUNS]
+#
+# For 1,000 and 5,000 records: ipmi-sel (LAN 2.0), ipmitool sel elist, the
+# provider's EnumerateInstances of ZAN_MgmtHwLogEntry through the host in a
+# new selprov process (cold) and as the second request of one selprov batch
+# (warm, unchanged SEL; selprov --timing), the same warm request on the
+# in-memory source with the same number of entries (what the layers above
+# the platform cost on their own), the warm EnumerateInstances of
+# ZAN_MgmtHwLog (one instance: mostly the IPMI source's own cost), and on
+# 5,000 records both requests right after 10 records were added.
+# Each figure is the median of RUNS runs (default 3).
+set -euo pipefail
+cd "$(dirname "$0")/.."
+
+runs=${1:-3}
+bin=build/bin
+for tool in selprov bmcsim selfixture; do
+    [[ -x $bin/$tool ]] || { echo "build first: $bin/$tool missing" >&2; exit 1; }
+done
+for tool in ipmi_sim ipmi-sel ipmitool; do
+    command -v "$tool" >/dev/null || { echo "$tool is not installed" >&2; exit 1; }
+done
+
+bench=$(mktemp -d /tmp/selprov-ipmi-bench.XXXXXX)
+cleanup() {
+    "$bin/bmcsim" stop --dir "$bench/sim" >/dev/null 2>&1 || true
+    rm -rf "$bench"
+}
+trap cleanup EXIT
+
+now() { date +%s.%N; }
+median() { sort -g | awk '{ v[NR] = $1 } END { print v[int((NR + 1) / 2)] }'; }
+
+# Seconds of one run of a command line (output discarded).
+seconds() {
+    local start end
+    start=$(now)
+    "$@" >/dev/null 2>&1
+    end=$(now)
+    echo "$end - $start" | bc -l
+}
+median_seconds() {
+    for ((i = 0; i < runs; i++)); do seconds "$@"; done | median
+}
+
+# The time selprov --timing gives for the N-th request of a batch, in s.
+nth_request() {
+    local n=$1
+    sed -n 's/^selprov: request took \([0-9.]*\) ms$/\1/p' | sed -n "${n}p" |
+        awk '{ printf "%.6f\n", $1 / 1000 }'
+}
+
+warm_request() { # config class
+    for ((i = 0; i < runs; i++)); do
+        printf 'enumerate %s\nenumerate %s\n' "$2" "$2" |
+            "$bin/selprov" --config "$1" --timing batch 2>&1 >/dev/null |
+            nth_request 2
+    done | median
+}
+
+# The second request of a batch that finds 10 records added after the first.
+ten_new_records() { # config class
+    for ((i = 0; i < runs; i++)); do
+        local fifo=$bench/requests timing=$bench/timing
+        rm -f "$fifo" "$timing"
+        mkfifo "$fifo"
+        "$bin/selprov" --config "$1" --timing batch <"$fifo" >/dev/null 2>"$timing" &
+        local pid=$!
+        exec 3>"$fifo"
+        echo "enumerate $2" >&3
+        for ((wait = 0; wait < 600; wait++)); do
+            grep -q 'request took' "$timing" && break
+            sleep 0.05
+        done
+        "$bin/bmcsim" add --dir "$bench/sim" --count 10
+        echo "enumerate $2" >&3
+        exec 3>&-
+        wait "$pid"
+        nth_request 2 <"$timing"
+    done | median
+}
+
+ratio() { echo "scale=4; $1 / $2" | bc -l; }
+row() { # what records seconds reference
+    printf '| %-52s | %6s | %10.3f | %8.4fx |\n' "$1" "$2" \
+        "$(echo "$3 * 1000" | bc -l)" "$(ratio "$3" "$4")"
+}
+
+echo "| measurement | records | ms | vs ipmi-sel |"
+echo "|---|---|---|---|"
+for records in 1000 5000; do
+    "$bin/bmcsim" stop --dir "$bench/sim" >/dev/null 2>&1 || true
+    rm -rf "$bench/sim"
+    mkdir -p "$bench/sim"
+    # Room for the records and the 10 added later, below 4096 free records
+    # so that the 16-bit free-space field does not wrap.
+    simulator=$("$bin/bmcsim" start --dir "$bench/sim" --generate "$records" \
+        --max-records $((records + 100)))
+    host=$(sed -n 's/^host=//p' <<<"$simulator")
+    port=${host##*:}
+
+    umask 077
+    printf 'password\n' >"$bench/password"
+    cat >"$bench/ipmi.conf" <<EOF
+source = ipmi
+ipmi.interface = lan
+ipmi.host = $host
+ipmi.user = admin
+ipmi.password-file = $bench/password
+ipmi.privilege = admin
+ipmi.workarounds = opensesspriv
+ipmi.state-directory = $bench/platform-state
+log.sink = none
+EOF
+    "$bin/selfixture" "$records" >"$bench/memory.fixture"
+    printf 'source = memory\nmemory.fixture = %s\nlog.sink = none\n' \
+        "$bench/memory.fixture" >"$bench/memory.conf"
+
+    ipmisel=(ipmi-sel -D LAN_2_0 -h "$host" -u admin -p password -l ADMIN
+             -W opensesspriv --sdr-cache-directory="$bench/sdrcache"
+             --quiet-cache)
+    ipmitool=(ipmitool -I lanplus -H 127.0.0.1 -p "$port" -U admin
+              -P password -C 3)
+    selprov=("$bin/selprov" --config "$bench/ipmi.conf")
+
+    # Untimed first runs build both SDR caches.
+    mkdir -p "$bench/sdrcache"
+    "${ipmisel[@]}" --sdr-cache-recreate >/dev/null 2>&1
+    "${selprov[@]}" enumerate-names ZAN_MgmtHwLog >/dev/null
+
+    reference=$(median_seconds "${ipmisel[@]}")
+    row "ipmi-sel (FreeIPMI, LAN 2.0)" "$records" "$reference" "$reference"
+    row "ipmitool sel elist" "$records" \
+        "$(median_seconds "${ipmitool[@]}" sel elist)" "$reference"
+    row "selprov enumerate, cold (new process)" "$records" \
+        "$(median_seconds "${selprov[@]}" enumerate ZAN_MgmtHwLogEntry)" \
+        "$reference"
+    row "selprov enumerate the log, cold (new process)" "$records" \
+        "$(median_seconds "${selprov[@]}" enumerate ZAN_MgmtHwLog)" \
+        "$reference"
+    row "Enumerate entries, warm (2nd request of a batch)" "$records" \
+        "$(warm_request "$bench/ipmi.conf" ZAN_MgmtHwLogEntry)" "$reference"
+    row "  the same on the in-memory source" "$records" \
+        "$(warm_request "$bench/memory.conf" ZAN_MgmtHwLogEntry)" "$reference"
+    row "Enumerate the log, warm (2nd request of a batch)" "$records" \
+        "$(warm_request "$bench/ipmi.conf" ZAN_MgmtHwLog)" "$reference"
+    row "  the same on the in-memory source" "$records" \
+        "$(warm_request "$bench/memory.conf" ZAN_MgmtHwLog)" "$reference"
+    if ((records == 5000)); then
+        row "Enumerate entries after 10 new records" "$records" \
+            "$(ten_new_records "$bench/ipmi.conf" ZAN_MgmtHwLogEntry)" \
+            "$reference"
+        row "Enumerate the log after 10 new records" "$records" \
+            "$(ten_new_records "$bench/ipmi.conf" ZAN_MgmtHwLog)" "$reference"
+    fi
+done

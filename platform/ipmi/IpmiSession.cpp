@@ -1,0 +1,403 @@
+#include "IpmiSession.h"
+
+#include "IpmiLog.h"
+
+#include <algorithm>
+#include <condition_variable>
+#include <exception>
+#include <mutex>
+#include <thread>
+
+namespace QX::Ipmi
+{
+
+namespace
+{
+
+using Clock = std::chrono::steady_clock;
+
+std::int64_t ticks(Clock::time_point when)
+{
+    return std::chrono::duration_cast<std::chrono::nanoseconds>(
+               when.time_since_epoch())
+        .count();
+}
+
+const char* driverName(ipmi_driver_type_t driver)
+{
+    switch (driver)
+    {
+        case IPMI_DEVICE_KCS:
+            return "KCS";
+        case IPMI_DEVICE_SMIC:
+            return "SMIC";
+        case IPMI_DEVICE_BT:
+            return "BT";
+        case IPMI_DEVICE_SSIF:
+            return "SSIF";
+        case IPMI_DEVICE_OPENIPMI:
+            return "OpenIPMI driver";
+        case IPMI_DEVICE_SUNBMC:
+            return "Sun BMC driver";
+        case IPMI_DEVICE_INTELDCMI:
+            return "Intel DCMI";
+        default:
+            return "driver probed at first use";
+    }
+}
+
+} // namespace
+
+IpmiSession::IpmiSession(SessionParameters parameters) :
+    parameters_(std::move(parameters)),
+    reopenAfter_(parameters_.lan ? std::min<std::chrono::milliseconds>(
+                                       std::chrono::milliseconds(
+                                           parameters_.sessionTimeoutMs / 2),
+                                       std::chrono::seconds(15))
+                                 : std::chrono::milliseconds::max()),
+    guarded_(!parameters_.lan || parameters_.guardExchanges)
+{
+}
+
+struct IpmiSession::PendingCall
+{
+    std::mutex mutex;
+    std::condition_variable finished;
+    bool done = false;
+    std::exception_ptr error;
+};
+
+std::string IpmiSession::peerName() const
+{
+    if (parameters_.lan)
+    {
+        return "LAN 2.0 " + parameters_.host;
+    }
+    return std::string("in-band (") +
+           driverName(context_ ? context_->driver() : parameters_.driver) + ")";
+}
+
+std::string IpmiSession::peerKey() const
+{
+    if (!parameters_.lan)
+    {
+        return "inband";
+    }
+    std::string key = "lan-" + parameters_.host;
+    for (char& c : key)
+    {
+        const bool plain = (c >= 'a' && c <= 'z') || (c >= 'A' && c <= 'Z') ||
+                           (c >= '0' && c <= '9') || c == '.' || c == '-';
+        if (!plain)
+        {
+            c = '_';
+        }
+    }
+    return key;
+}
+
+std::shared_ptr<IpmiContext> IpmiSession::open()
+{
+    if (abandoned_)
+    {
+        const std::lock_guard lock(abandoned_->mutex);
+        if (!abandoned_->done)
+        {
+            throw IpmiError("IPMI exchange", ErrorCategory::Busy,
+                            "the driver has not yet returned from an "
+                            "exchange given up on after the timeout");
+        }
+    }
+    abandoned_.reset();
+    if (context_)
+    {
+        const Clock::time_point last{
+            std::chrono::nanoseconds(lastActivity_.load())};
+        if (Clock::now() - last < reopenAfter_)
+        {
+            return context_;
+        }
+        // Idle long enough that the BMC, or FreeIPMI's own bookkeeping,
+        // may already count the session as dead: start a fresh one.
+        context_.reset();
+    }
+    try
+    {
+        context_ = std::make_shared<IpmiContext>(parameters_);
+    }
+    catch (const IpmiError&)
+    {
+        touch();
+        lost_ = true;
+        throw;
+    }
+    ++generation_;
+    touch();
+    // Routine re-opens after idle time are not worth a line; the first
+    // session and the first one after a failure are.
+    if (generation_.load() == 1 || lost_)
+    {
+        logLine(logLevelInfo, "IpmiSession::open", __LINE__,
+                std::string(lost_ ? "IPMI session opened again: "
+                                  : "IPMI session opened: ") +
+                    peerName());
+    }
+    lost_ = false;
+    return context_;
+}
+
+void IpmiSession::touch()
+{
+    lastActivity_.store(ticks(Clock::now()));
+}
+
+template <typename Result, typename Work>
+Result IpmiSession::guardedCall(const std::shared_ptr<IpmiContext>& context,
+                                Work work)
+{
+    // The helper owns what it touches, so it may outlive this call (and
+    // this session) when the driver does not return in time.
+    auto call = std::make_shared<PendingCall>();
+    using Stored = std::conditional_t<std::is_void_v<Result>, bool, Result>;
+    auto result = std::make_shared<std::optional<Stored>>();
+    std::thread(
+        [call, context, result, work]() mutable
+        {
+            try
+            {
+                if constexpr (std::is_void_v<Result>)
+                {
+                    work(*context);
+                    result->emplace(true);
+                }
+                else
+                {
+                    result->emplace(work(*context));
+                }
+            }
+            catch (...)
+            {
+                call->error = std::current_exception();
+            }
+            {
+                const std::lock_guard lock(call->mutex);
+                call->done = true;
+            }
+            call->finished.notify_all();
+        })
+        .detach();
+
+    const auto timeout = std::chrono::milliseconds(
+        parameters_.guardTimeoutMs != 0 ? parameters_.guardTimeoutMs
+                                        : parameters_.sessionTimeoutMs);
+    std::unique_lock lock(call->mutex);
+    if (!call->finished.wait_for(lock, timeout, [&call] { return call->done; }))
+    {
+        lock.unlock();
+        abandoned_ = call;
+        throw IpmiError("IPMI exchange", ErrorCategory::Timeout,
+                        "no answer from the driver within " +
+                            std::to_string(timeout.count()) + " ms");
+    }
+    if (call->error)
+    {
+        std::rethrow_exception(call->error);
+    }
+    if constexpr (!std::is_void_v<Result>)
+    {
+        return std::move(**result);
+    }
+}
+
+template <typename Result, typename Work>
+Result IpmiSession::exchange(Work work)
+{
+    const std::shared_ptr<IpmiContext> context = open();
+    try
+    {
+        if (guarded_)
+        {
+            if constexpr (std::is_void_v<Result>)
+            {
+                guardedCall<void>(context, work);
+                touch();
+                return;
+            }
+            else
+            {
+                Result result = guardedCall<Result>(context, work);
+                touch();
+                return result;
+            }
+        }
+        if constexpr (std::is_void_v<Result>)
+        {
+            work(*context);
+            touch();
+        }
+        else
+        {
+            Result result = work(*context);
+            touch();
+            return result;
+        }
+    }
+    catch (const IpmiError& error)
+    {
+        touch();
+        if (error.sessionLost())
+        {
+            context_.reset();
+            lost_ = true;
+        }
+        throw;
+    }
+}
+
+void IpmiSession::run(const std::function<void(IpmiContext&)>& work)
+{
+    // Not guarded: the work uses its caller's state, which must not be
+    // left to a helper thread. The SDR cache code it runs makes single
+    // driver calls bounded by the driver.
+    const std::shared_ptr<IpmiContext> context = open();
+    try
+    {
+        work(*context);
+        touch();
+    }
+    catch (const IpmiError& error)
+    {
+        touch();
+        if (error.sessionLost())
+        {
+            context_.reset();
+            lost_ = true;
+        }
+        throw;
+    }
+}
+
+SelInfo IpmiSession::getSelInfo()
+{
+    return exchange<SelInfo>(
+        [](IpmiContext& context)
+        {
+            FiidObject response(tmpl_cmd_get_sel_info_rs);
+            context.check(ipmi_cmd_get_sel_info(context.get(), response.get()),
+                          "ipmi_cmd_get_sel_info", response,
+                          IPMI_NET_FN_STORAGE_RQ);
+            SelInfo info;
+            info.entries =
+                static_cast<std::uint16_t>(response.field("entries"));
+            info.freeSpace =
+                static_cast<std::uint16_t>(response.field("free_space"));
+            info.mostRecentAddition = static_cast<std::uint32_t>(
+                response.field("most_recent_addition_timestamp"));
+            info.mostRecentErase = static_cast<std::uint32_t>(
+                response.field("most_recent_erase_timestamp"));
+            info.overflow = response.field("overflow_flag") != 0;
+            info.reserveSupported =
+                response.field("reserve_sel_command_supported") != 0;
+            return info;
+        });
+}
+
+std::uint16_t IpmiSession::reserveSel()
+{
+    return exchange<std::uint16_t>(
+        [](IpmiContext& context)
+        {
+            FiidObject response(tmpl_cmd_reserve_sel_rs);
+            context.check(ipmi_cmd_reserve_sel(context.get(), response.get()),
+                          "ipmi_cmd_reserve_sel", response,
+                          IPMI_NET_FN_STORAGE_RQ);
+            return static_cast<std::uint16_t>(response.field("reservation_id"));
+        });
+}
+
+SelEntry IpmiSession::getSelEntry(std::uint16_t reservationId,
+                                  std::uint16_t recordId)
+{
+    return exchange<SelEntry>(
+        [reservationId, recordId](IpmiContext& context)
+        {
+            FiidObject response(tmpl_cmd_get_sel_entry_rs);
+            context.check(
+                ipmi_cmd_get_sel_entry(
+                    context.get(), reservationId, recordId, 0,
+                    IPMI_SEL_READ_ENTIRE_RECORD_BYTES_TO_READ, response.get()),
+                "ipmi_cmd_get_sel_entry", response, IPMI_NET_FN_STORAGE_RQ);
+            SelEntry entry;
+            entry.nextRecordId =
+                static_cast<std::uint16_t>(response.field("next_record_id"));
+            response.data("record_data", entry.data);
+            return entry;
+        });
+}
+
+void IpmiSession::initiateSelErase(std::uint16_t reservationId)
+{
+    exchange<void>(
+        [reservationId](IpmiContext& context)
+        {
+            FiidObject response(tmpl_cmd_clear_sel_rs);
+            context.check(
+                ipmi_cmd_clear_sel(context.get(), reservationId,
+                                   IPMI_SEL_CLEAR_OPERATION_INITIATE_ERASE,
+                                   response.get()),
+                "ipmi_cmd_clear_sel", response, IPMI_NET_FN_STORAGE_RQ);
+        });
+}
+
+bool IpmiSession::selEraseCompleted(std::uint16_t reservationId)
+{
+    return exchange<bool>(
+        [reservationId](IpmiContext& context)
+        {
+            FiidObject response(tmpl_cmd_clear_sel_rs);
+            context.check(
+                ipmi_cmd_clear_sel(context.get(), reservationId,
+                                   IPMI_SEL_CLEAR_OPERATION_GET_ERASURE_STATUS,
+                                   response.get()),
+                "ipmi_cmd_clear_sel", response, IPMI_NET_FN_STORAGE_RQ);
+            return response.field("erasure_progress") ==
+                   IPMI_SEL_CLEAR_ERASE_COMPLETED;
+        });
+}
+
+std::optional<std::uint8_t> IpmiSession::getSystemRestartCause()
+{
+    return exchange<std::optional<std::uint8_t>>(
+        [](IpmiContext& context) -> std::optional<std::uint8_t>
+        {
+            FiidObject response(tmpl_cmd_get_system_restart_cause_rs);
+            try
+            {
+                context.check(ipmi_cmd_get_system_restart_cause(context.get(),
+                                                                response.get()),
+                              "ipmi_cmd_get_system_restart_cause", response,
+                              IPMI_NET_FN_CHASSIS_RQ);
+            }
+            catch (const IpmiError& error)
+            {
+                if (error.completionCode() == completionInvalidCommand)
+                {
+                    return std::nullopt;
+                }
+                throw;
+            }
+            return static_cast<std::uint8_t>(response.field("restart_cause"));
+        });
+}
+
+std::uint64_t IpmiSession::sessionGeneration() const
+{
+    return generation_.load();
+}
+
+Clock::time_point IpmiSession::lastActivity() const
+{
+    return Clock::time_point(std::chrono::nanoseconds(lastActivity_.load()));
+}
+
+} // namespace QX::Ipmi

@@ -1,0 +1,89 @@
+#pragma once
+
+#include "BmcCommands.h"
+#include "FreeIpmiHandles.h"
+
+#include <atomic>
+#include <chrono>
+#include <functional>
+#include <memory>
+#include <optional>
+#include <string>
+
+namespace QX::Ipmi
+{
+
+/**
+ * @brief The process's one IPMI session (LAN 2.0) or in-band device,
+ *        opened on first use, reused, and opened again when needed.
+ *
+ * Over the LAN, FreeIPMI gives up on an exchange once the session timeout
+ * has passed since the last packet received, and BMCs drop sessions left
+ * idle (the OpenIPMI simulator after 30 s). So a session idle for half the
+ * timeout (at most 15 s) is replaced before the next exchange, and a
+ * session whose exchange timed out or failed at the session level is
+ * closed: the next exchange opens a new one. Nothing is retried here; a
+ * failure throws IpmiError at once.
+ *
+ * In-band drivers wait on the BMC with timeouts of their own, longer than
+ * the configured one. So in-band exchanges run on a helper thread that
+ * shares the context, and the caller waits at most the timeout: then it
+ * throws (Timeout) and leaves the context to the helper. Until the driver
+ * returns, further exchanges fail at once (Busy); afterwards a new context
+ * is opened.
+ *
+ * Not thread-safe: callers serialize every member except lastActivity()
+ * and sessionGeneration(), which any thread may read.
+ */
+class IpmiSession : public BmcCommands
+{
+  public:
+    explicit IpmiSession(SessionParameters parameters);
+
+    IpmiSession(const IpmiSession&) = delete;
+    IpmiSession& operator=(const IpmiSession&) = delete;
+
+    SelInfo getSelInfo() override;
+    std::uint16_t reserveSel() override;
+    SelEntry getSelEntry(std::uint16_t reservationId,
+                         std::uint16_t recordId) override;
+    void initiateSelErase(std::uint16_t reservationId) override;
+    bool selEraseCompleted(std::uint16_t reservationId) override;
+    std::optional<std::uint8_t> getSystemRestartCause() override;
+    std::uint64_t sessionGeneration() const override;
+    std::chrono::steady_clock::time_point lastActivity() const override;
+
+    /**
+     * Runs @p work with the open context, as one exchange: the session is
+     * opened first if needed, and closed if @p work throws an IpmiError
+     * that loses it. For FreeIPMI calls that take the context themselves
+     * (the SDR cache).
+     */
+    void run(const std::function<void(IpmiContext&)>& work);
+
+    /** "LAN 2.0 host:port" or "in-band (KCS)", for log lines. */
+    std::string peerName() const;
+    /** A name for files kept per BMC: "lan-host_port" or "inband". */
+    std::string peerKey() const;
+
+  private:
+    struct PendingCall;
+
+    std::shared_ptr<IpmiContext> open();
+    template <typename Result, typename Work>
+    Result exchange(Work work);
+    template <typename Result, typename Work>
+    Result guardedCall(const std::shared_ptr<IpmiContext>& context, Work work);
+    void touch();
+
+    SessionParameters parameters_;
+    std::chrono::milliseconds reopenAfter_;
+    bool guarded_;
+    std::shared_ptr<IpmiContext> context_;
+    std::shared_ptr<PendingCall> abandoned_; // still inside the driver
+    bool lost_ = false; // the last session ended in a failure
+    std::atomic<std::uint64_t> generation_{0};
+    std::atomic<std::int64_t> lastActivity_{0}; // steady clock, ns
+};
+
+} // namespace QX::Ipmi

@@ -1,0 +1,363 @@
+#include "IpmiSource.h"
+
+#include "IpmiError.h"
+#include "IpmiLog.h"
+#include "SelRecordText.h"
+
+#include <algorithm>
+#include <cstdio>
+#include <thread>
+
+namespace QX::Ipmi
+{
+
+namespace
+{
+
+using namespace NodeLexicon;
+
+// Get SEL Info's free space field is 16 bits: FFFFh means "65535 bytes or
+// more", 4095 more records of 16 bytes at the least.
+constexpr std::uint16_t freeSpaceAtLeast = 0xFFFF;
+constexpr unsigned recordBytes = 16;
+constexpr std::uint32_t noEraseYet = 0xFFFFFFFF;
+constexpr unsigned nodeStatusOk = 1;
+
+// Raw OverwritePolicy values: 1 wraps when full, 2 never overwrites.
+constexpr unsigned overwriteWraps = 1;
+constexpr unsigned overwriteNever = 2;
+
+constexpr auto erasePollInterval = std::chrono::milliseconds(20);
+
+void logFailure(const char* what, const std::exception& error)
+{
+    logLine(logLevelFailure, "IpmiSource", __LINE__,
+            std::string(what) + " failed: " + error.what());
+}
+
+} // namespace
+
+IpmiSource::IpmiSource(std::unique_ptr<BmcCommands> bmc,
+                       std::unique_ptr<RecordDescriber> describer,
+                       const Settings& settings,
+                       std::string controllerDescription) :
+    bmc_(std::move(bmc)),
+    describer_(std::move(describer)), settings_(settings),
+    controllerDescription_(std::move(controllerDescription)),
+    gate_(std::chrono::milliseconds(settings.timeoutMs),
+          [bmc = bmc_.get()] { return bmc->lastActivity(); })
+{
+    // The password is not needed beyond the session.
+    settings_.password.clear();
+    rebuildEntries();
+}
+
+// The describer may refer to the session: it goes first.
+IpmiSource::~IpmiSource()
+{
+    describer_.reset();
+}
+
+std::string IpmiSource::entryPath(std::uint32_t run, std::uint16_t recordId)
+{
+    char suffix[32];
+    if (run == 0)
+    {
+        std::snprintf(suffix, sizeof suffix, "/entry-%05u",
+                      static_cast<unsigned>(recordId));
+    }
+    else
+    {
+        std::snprintf(suffix, sizeof suffix, "/entry-r%05u-%05u",
+                      static_cast<unsigned>(run),
+                      static_cast<unsigned>(recordId));
+    }
+    return std::string(logPath) + suffix;
+}
+
+std::shared_ptr<const NodeTree> IpmiSource::snapshot()
+{
+    try
+    {
+        const BmcGate::Access access(gate_);
+        return refreshTree();
+    }
+    catch (const IpmiError& error)
+    {
+        logFailure("Reading the SEL", error);
+        throw;
+    }
+}
+
+std::shared_ptr<const NodeTree> IpmiSource::refreshTree()
+{
+    const SelChange change = cache_.refresh(*bmc_, *describer_);
+    if (change == SelChange::Replaced)
+    {
+        rebuildEntries();
+    }
+    else if (change == SelChange::Appended)
+    {
+        const auto& records = cache_.records();
+        for (std::size_t i = cache_.firstNew(); i < records.size(); ++i)
+        {
+            addEntry(records[i]);
+        }
+        builderChanged_ = true;
+    }
+    const LogState state = logState();
+    if (!logState_ || state != *logState_)
+    {
+        applyLogState(state);
+    }
+    refreshRestartCause(change != SelChange::None);
+    if (builderChanged_ || !tree_)
+    {
+        tree_ = builder_.build();
+        builderChanged_ = false;
+    }
+    return tree_;
+}
+
+void IpmiSource::rebuildEntries()
+{
+    builder_ = NodeTreeBuilder();
+    builder_.addNode(ManagementController, controllerPath, "",
+                     controllerDescription_, nodeStatusOk);
+    builder_.addNode(EventLog, logPath, controllerPath, "IPMI System Event Log",
+                     nodeStatusOk);
+    builder_.setProperty(logPath, Name, std::string(logName));
+    builder_.setProperty(logPath, DataFormat, std::string(dataFormat));
+    builder_.addNode(Watchdog, watchdogPath, controllerPath,
+                     "BMC watchdog timer", nodeStatusOk);
+    for (const CachedRecord& record : cache_.records())
+    {
+        addEntry(record);
+    }
+    // The new builder lacks the log state and the restart cause.
+    logState_.reset();
+    applyRestartCause();
+    builderChanged_ = true;
+}
+
+void IpmiSource::addEntry(const CachedRecord& record)
+{
+    const std::string path = entryPath(record.run, record.id);
+    builder_.addNode(EventLogEntry, path, logPath, record.description, 0);
+    builder_.setProperty(path, RecordId, static_cast<unsigned>(record.id));
+    builder_.setProperty(path, RecordData, hexText(record.bytes));
+    builder_.setProperty(path, Timestamp,
+                         timestampText(record.bytes, settings_.selClock));
+}
+
+IpmiSource::LogState IpmiSource::logState() const
+{
+    const SelInfo& info = cache_.info();
+    const auto& records = cache_.records();
+    const auto count = static_cast<unsigned>(records.size());
+
+    LogState state;
+    bool noRoomLeft = info.overflow;
+    if (settings_.selCapacity != 0)
+    {
+        state.maxRecords = settings_.selCapacity;
+    }
+    else if (info.freeSpace == freeSpaceAtLeast)
+    {
+        state.maxRecords = count + freeSpaceAtLeast / recordBytes;
+    }
+    else
+    {
+        state.maxRecords = count + info.freeSpace / recordBytes;
+        noRoomLeft = noRoomLeft || info.freeSpace < recordBytes;
+    }
+    state.maxRecords = std::max(state.maxRecords, count);
+    state.overwritePolicy =
+        settings_.selWraps ? overwriteWraps : overwriteNever;
+    // BMCs log "Log Area Reset/Cleared" right after a clear: a log that
+    // holds only that record has been emptied.
+    state.isEmpty =
+        records.empty() ||
+        (records.size() == 1 && isLogClearedRecord(records.front().bytes));
+    const bool erased =
+        info.mostRecentErase != 0 && info.mostRecentErase != noEraseYet;
+
+    if (noRoomLeft || count >= state.maxRecords)
+    {
+        state.status = EventLogStatusFull;
+    }
+    else if (static_cast<std::uint64_t>(count) * 100 >=
+             static_cast<std::uint64_t>(settings_.warningFillPercent) *
+                 state.maxRecords)
+    {
+        state.status = EventLogStatusAlmostFull;
+    }
+    else if (state.isEmpty && erased)
+    {
+        state.status = EventLogStatusCleared;
+    }
+    else
+    {
+        state.status = nodeStatusOk;
+    }
+    return state;
+}
+
+void IpmiSource::applyLogState(const LogState& state)
+{
+    builder_.setProperty(logPath, MaxRecords, state.maxRecords);
+    builder_.setProperty(logPath, OverwritePolicy, state.overwritePolicy);
+    builder_.setProperty(logPath, IsEmpty, state.isEmpty);
+    builder_.setStatus(logPath, state.status);
+    logState_ = state;
+    builderChanged_ = true;
+}
+
+void IpmiSource::refreshRestartCause(bool selChanged)
+{
+    // The cause changes only when the server restarts, which new SEL
+    // records or a new session (a restarted BMC) come with.
+    const std::uint64_t generation = bmc_->sessionGeneration();
+    if (!selChanged && restartCauseGeneration_ == generation)
+    {
+        return;
+    }
+    std::optional<std::uint8_t> cause;
+    try
+    {
+        cause = bmc_->getSystemRestartCause();
+    }
+    catch (const IpmiError& error)
+    {
+        if (error.category() != ErrorCategory::CompletionCode)
+        {
+            throw;
+        }
+        // Refused (privilege, say): report no cause rather than no SEL.
+        if (!restartCauseGeneration_)
+        {
+            logFailure("Get System Restart Cause", error);
+        }
+    }
+    restartCauseGeneration_ = generation;
+    if (cause != restartCause_)
+    {
+        restartCause_ = cause;
+        applyRestartCause();
+    }
+}
+
+void IpmiSource::applyRestartCause()
+{
+    if (restartCause_)
+    {
+        builder_.setProperty(watchdogPath, RestartCause,
+                             static_cast<unsigned>(*restartCause_));
+    }
+    else
+    {
+        builder_.removeProperty(watchdogPath, RestartCause);
+    }
+    builderChanged_ = true;
+}
+
+bool IpmiSource::writeProperty(const std::string& path,
+                               NodeLexicon::Properties property, unsigned value)
+{
+    if (path != controllerPath || property != Command ||
+        value != ClearEventLogCommand)
+    {
+        return false;
+    }
+    try
+    {
+        const BmcGate::Access access(gate_);
+        clearSel();
+    }
+    catch (const IpmiError& error)
+    {
+        logFailure("Clearing the SEL", error);
+        throw;
+    }
+    logLine(logLevelInfo, "IpmiSource", __LINE__, "SEL cleared");
+    return true;
+}
+
+void IpmiSource::clearSel()
+{
+    // The copy no longer matches the SEL, whatever happens below.
+    cache_.invalidate();
+    const SelInfo info = bmc_->getSelInfo();
+    for (unsigned attempt = 1;; ++attempt)
+    {
+        const std::uint16_t reservation =
+            info.reserveSupported ? bmc_->reserveSel() : 0;
+        try
+        {
+            bmc_->initiateSelErase(reservation);
+            const auto deadline =
+                std::chrono::steady_clock::now() +
+                std::chrono::milliseconds(settings_.timeoutMs);
+            while (!bmc_->selEraseCompleted(reservation))
+            {
+                if (std::chrono::steady_clock::now() >= deadline)
+                {
+                    throw IpmiError("Clear SEL", ErrorCategory::Timeout,
+                                    "the BMC did not finish erasing within " +
+                                        std::to_string(settings_.timeoutMs) +
+                                        " ms");
+                }
+                std::this_thread::sleep_for(erasePollInterval);
+            }
+            return;
+        }
+        catch (const IpmiError& error)
+        {
+            // Another client reserved the SEL in between: reserve again.
+            if (error.completionCode() != completionReservationCancelled ||
+                attempt >= SelCache::walkAttempts)
+            {
+                throw;
+            }
+        }
+    }
+}
+
+std::string IpmiSource::printablePath(const std::string& path) const
+{
+    return "IPMI:" + path;
+}
+
+void IpmiSource::startMonitoring(NodeLexicon::NodeType kind,
+                                 MonitorCallback callback, const void* context)
+{
+    const std::lock_guard lock(monitorMutex_);
+    monitors_.push_back(Monitor{kind, callback, context});
+}
+
+void IpmiSource::stopMonitoring(NodeLexicon::NodeType kind,
+                                MonitorCallback callback, const void* context)
+{
+    const std::lock_guard lock(monitorMutex_);
+    const auto found = std::find_if(monitors_.begin(), monitors_.end(),
+                                    [&](const Monitor& monitor)
+                                    {
+                                        return monitor.kind == kind &&
+                                               monitor.callback == callback &&
+                                               monitor.context == context;
+                                    });
+    if (found != monitors_.end())
+    {
+        monitors_.erase(found);
+    }
+}
+
+std::size_t IpmiSource::monitorCount(NodeLexicon::NodeType kind) const
+{
+    const std::lock_guard lock(monitorMutex_);
+    return static_cast<std::size_t>(
+        std::count_if(monitors_.begin(), monitors_.end(),
+                      [kind](const Monitor& m) { return m.kind == kind; }));
+}
+
+} // namespace QX::Ipmi

@@ -1,0 +1,135 @@
+#include "SelRecordText.h"
+
+#include <cstdio>
+#include <ctime>
+
+namespace QX::Ipmi
+{
+
+namespace
+{
+
+constexpr std::uint8_t systemEventRecord = 0x02;
+constexpr std::uint8_t firstTimestampedOem = 0xC0;
+constexpr std::uint8_t lastTimestampedOem = 0xDF;
+constexpr std::uint32_t unspecifiedTimestamp = 0xFFFFFFFF;
+
+// System event record fields (IPMI 2.0, section 32.1).
+constexpr std::size_t sensorTypeByte = 10;
+constexpr std::size_t eventTypeByte = 12; // bit 7: deassertion
+constexpr std::size_t eventData1Byte = 13;
+constexpr std::uint8_t sensorTypeEventLoggingDisabled = 0x10;
+constexpr std::uint8_t eventTypeSensorSpecific = 0x6F;
+constexpr std::uint8_t offsetLogAreaResetCleared = 0x02;
+
+std::uint32_t rawTimestamp(const SelRecordBytes& record)
+{
+    return static_cast<std::uint32_t>(record[3]) |
+           static_cast<std::uint32_t>(record[4]) << 8 |
+           static_cast<std::uint32_t>(record[5]) << 16 |
+           static_cast<std::uint32_t>(record[6]) << 24;
+}
+
+bool hasTimestamp(std::uint8_t type)
+{
+    return type == systemEventRecord ||
+           (type >= firstTimestampedOem && type <= lastTimestampedOem);
+}
+
+// The UTC instant of a wall-clock time that the BMC counted in the host's
+// local zone, as ipmi-sel's --localtime-to-utc.
+std::optional<std::int64_t> localToUtc(std::uint32_t localSeconds)
+{
+    const std::time_t wall = static_cast<std::time_t>(localSeconds);
+    std::tm fields{};
+    if (gmtime_r(&wall, &fields) == nullptr)
+    {
+        return std::nullopt;
+    }
+    fields.tm_isdst = -1;
+    const std::time_t instant = std::mktime(&fields);
+    if (instant == static_cast<std::time_t>(-1))
+    {
+        return std::nullopt;
+    }
+    return static_cast<std::int64_t>(instant);
+}
+
+} // namespace
+
+std::uint16_t recordIdOf(const SelRecordBytes& record)
+{
+    return static_cast<std::uint16_t>(record[0] | record[1] << 8);
+}
+
+std::uint8_t recordTypeOf(const SelRecordBytes& record)
+{
+    return record[2];
+}
+
+std::string hexText(const SelRecordBytes& record)
+{
+    constexpr std::size_t size = std::tuple_size_v<SelRecordBytes>;
+    char text[size * 3 + 1];
+    for (std::size_t i = 0; i < size; ++i)
+    {
+        std::snprintf(text + 3 * i, 4, "%02x ", record[i]);
+    }
+    return std::string(text, size * 3 - 1);
+}
+
+std::optional<std::int64_t> recordTime(const SelRecordBytes& record,
+                                       SelClock clock)
+{
+    if (!hasTimestamp(recordTypeOf(record)))
+    {
+        return std::nullopt;
+    }
+    const std::uint32_t raw = rawTimestamp(record);
+    if (raw <= lastPreInitTimestamp || raw == unspecifiedTimestamp)
+    {
+        return std::nullopt;
+    }
+    if (clock == SelClock::Local)
+    {
+        return localToUtc(raw);
+    }
+    return static_cast<std::int64_t>(raw);
+}
+
+std::string timestampText(const SelRecordBytes& record, SelClock clock)
+{
+    const std::optional<std::int64_t> seconds = recordTime(record, clock);
+    if (!seconds)
+    {
+        return unknownTimestamp;
+    }
+    const std::time_t instant = static_cast<std::time_t>(*seconds);
+    std::tm fields{};
+    char text[32];
+    if (gmtime_r(&instant, &fields) == nullptr ||
+        std::strftime(text, sizeof text, "%Y-%m-%d %H:%M:%S", &fields) == 0)
+    {
+        return unknownTimestamp;
+    }
+    return text;
+}
+
+bool isLogClearedRecord(const SelRecordBytes& record)
+{
+    return recordTypeOf(record) == systemEventRecord &&
+           record[sensorTypeByte] == sensorTypeEventLoggingDisabled &&
+           record[eventTypeByte] == eventTypeSensorSpecific &&
+           (record[eventData1Byte] & 0x0F) == offsetLogAreaResetCleared;
+}
+
+std::string fallbackDescription(const SelRecordBytes& record)
+{
+    char type[32];
+    std::snprintf(type, sizeof type,
+                  "SEL record type %02Xh: ", recordTypeOf(record));
+    // Bytes 0-2 are the id and the type, already said.
+    return type + hexText(record).substr(9);
+}
+
+} // namespace QX::Ipmi

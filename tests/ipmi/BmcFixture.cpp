@@ -1,0 +1,160 @@
+#include "BmcFixture.h"
+
+#include "CVLogger.h"
+#include "Platform.h"
+#include "ipmi/IpmiSourceFactory.h"
+
+#include <cstdio>
+#include <sstream>
+#include <stdexcept>
+
+namespace bmctest
+{
+
+void BmcTest::SetUp()
+{
+    if (!bmcsim::SimulatedBmc::available())
+    {
+        GTEST_SKIP() << "ipmi_sim is not installed (Debian package openipmi): "
+                        "the BMC simulator tests are skipped";
+    }
+    CVLog::CVLogger::setSink(nullptr);
+}
+
+void BmcTest::TearDown()
+{
+    host_.reset();
+    QX::Platform::overrideSource(nullptr);
+    source.reset();
+    bmc_.reset();
+}
+
+QX::Ipmi::Settings BmcTest::settings(unsigned timeoutMs) const
+{
+    QX::Ipmi::Settings settings;
+    settings.interface = QX::Ipmi::Interface::Lan;
+    settings.host = bmc_->host();
+    settings.user = bmc_->options().user;
+    settings.password = bmc_->options().password;
+    settings.privilege = "admin";
+    settings.workarounds = {"opensesspriv"};
+    settings.timeoutMs = timeoutMs;
+    settings.retransmissionTimeoutMs = 250;
+    settings.stateDirectory = bmc_->directory() + "/platform-state";
+    return settings;
+}
+
+void BmcTest::start(bmcsim::Options options, unsigned timeoutMs)
+{
+    bmc_ = std::make_unique<bmcsim::SimulatedBmc>(std::move(options));
+    bmc_->start();
+    source = QX::Ipmi::makeIpmiSource(settings(timeoutMs), "");
+    QX::Platform::overrideSource(source);
+    host_ = std::make_unique<host::Host>(SELPROV_LIBRARY);
+}
+
+host::Outcome BmcTest::enumerate(const std::string& className)
+{
+    host::ObjectPath path;
+    path.nameSpace = "root/zanqx";
+    path.className = className;
+    return host_->enumerateInstances(path);
+}
+
+host::Outcome BmcTest::clearLog()
+{
+    host::ObjectPath path;
+    path.nameSpace = "root/zanqx";
+    path.className = "ZAN_MgmtHwLog";
+    path.keys.push_back({"Name", host::Value::string("IPMI SEL Log")});
+    path.keys.push_back(
+        {"CreationClassName", host::Value::string("ZAN_MgmtHwLog")});
+    return host_->invokeMethod(path, "ClearLog");
+}
+
+std::string BmcTest::ipmitool(const std::string& arguments) const
+{
+    const std::string command =
+        "TZ=UTC " + bmc_->ipmitool() + " " + arguments + " 2>&1";
+    FILE* pipe = ::popen(command.c_str(), "r");
+    if (pipe == nullptr)
+    {
+        throw std::runtime_error("cannot run ipmitool");
+    }
+    std::string output;
+    char buffer[4096];
+    std::size_t read = 0;
+    while ((read = std::fread(buffer, 1, sizeof buffer, pipe)) > 0)
+    {
+        output.append(buffer, read);
+    }
+    ::pclose(pipe);
+    return output;
+}
+
+std::vector<IpmitoolRecord> BmcTest::ipmitoolRecords() const
+{
+    std::vector<IpmitoolRecord> records;
+    unsigned next = 0;
+    while (next != 0xFFFF && records.size() < 1000)
+    {
+        char arguments[64];
+        std::snprintf(arguments, sizeof arguments,
+                      "raw 0x0a 0x43 0 0 0x%02x 0x%02x 0 0xff", next & 0xFF,
+                      next >> 8);
+        std::istringstream words(ipmitool(arguments));
+        std::vector<unsigned> bytes;
+        std::string word;
+        while (words >> word)
+        {
+            bytes.push_back(
+                static_cast<unsigned>(std::stoul(word, nullptr, 16)));
+        }
+        if (bytes.size() != 18)
+        {
+            break; // an empty SEL answers CBh
+        }
+        IpmitoolRecord record;
+        record.id = bytes[2] | bytes[3] << 8;
+        for (std::size_t i = 2; i < bytes.size(); ++i)
+        {
+            char pair[4];
+            std::snprintf(pair, sizeof pair,
+                          i + 1 < bytes.size() ? "%02x " : "%02x", bytes[i]);
+            record.bytes += pair;
+        }
+        records.push_back(record);
+        next = bytes[0] | bytes[1] << 8;
+    }
+    return records;
+}
+
+unsigned BmcTest::ipmitoolEntries() const
+{
+    std::istringstream lines(ipmitool("sel info"));
+    std::string line;
+    while (std::getline(lines, line))
+    {
+        if (line.starts_with("Entries"))
+        {
+            return static_cast<unsigned>(
+                std::stoul(line.substr(line.find(':') + 1)));
+        }
+    }
+    throw std::runtime_error("ipmitool sel info gave no entry count");
+}
+
+std::string text(const host::Instance& instance, const std::string& name)
+{
+    const host::Value* value = instance.property(name);
+    return value != nullptr ? value->text : std::string();
+}
+
+std::uint64_t number(const host::Instance& instance, const std::string& name)
+{
+    const host::Value* value = instance.property(name);
+    EXPECT_NE(value, nullptr) << name;
+    return value != nullptr ? value->u : 0;
+}
+
+} // namespace bmctest

@@ -1,0 +1,189 @@
+// The FreeIPMI session on the simulated BMC: reuse, reopening after idle
+// time, and the error categories of real failures.
+
+#include "SimulatedBmc.h"
+#include "ipmi/IpmiSession.h"
+
+#include <chrono>
+#include <thread>
+
+#include <gmock/gmock.h>
+#include <gtest/gtest.h>
+
+namespace
+{
+
+using namespace QX::Ipmi;
+using ::testing::HasSubstr;
+
+class SessionTest : public ::testing::Test
+{
+  protected:
+    void SetUp() override
+    {
+        if (!bmcsim::SimulatedBmc::available())
+        {
+            GTEST_SKIP() << "ipmi_sim is not installed (Debian package "
+                            "openipmi): the BMC simulator tests are skipped";
+        }
+        bmc = std::make_unique<bmcsim::SimulatedBmc>(bmcsim::Options{});
+        bmc->start();
+    }
+
+    SessionParameters parameters(unsigned timeoutMs = 1000) const
+    {
+        SessionParameters p;
+        p.lan = true;
+        p.host = bmc->host();
+        p.user = "admin";
+        p.password = "password";
+        p.privilege = IPMI_PRIVILEGE_LEVEL_ADMIN;
+        p.sessionTimeoutMs = timeoutMs;
+        p.retransmissionTimeoutMs = 200;
+        p.workaroundFlags =
+            IPMI_WORKAROUND_FLAGS_OUTOFBAND_2_0_OPEN_SESSION_PRIVILEGE;
+        return p;
+    }
+
+    std::unique_ptr<bmcsim::SimulatedBmc> bmc;
+};
+
+TEST_F(SessionTest, OneSessionServesBackToBackExchanges)
+{
+    IpmiSession session(parameters());
+    EXPECT_EQ(session.getSelInfo().entries, 0u);
+    EXPECT_EQ(session.getSelInfo().entries, 0u);
+    EXPECT_EQ(session.sessionGeneration(), 1u);
+}
+
+TEST_F(SessionTest, IdleSessionIsReplacedBeforeTheNextExchange)
+{
+    // Reopened after half the timeout without an exchange.
+    IpmiSession session(parameters(1000));
+    session.getSelInfo();
+    std::this_thread::sleep_for(std::chrono::milliseconds(700));
+    EXPECT_EQ(session.getSelInfo().entries, 0u);
+    EXPECT_EQ(session.sessionGeneration(), 2u);
+}
+
+TEST_F(SessionTest, BmcWithoutTheCommandGivesNoRestartCause)
+{
+    IpmiSession session(parameters());
+    EXPECT_EQ(session.getSystemRestartCause(), std::nullopt);
+}
+
+TEST_F(SessionTest, CancelledReservationIsCompletionCodeC5)
+{
+    bmc->addRecords(bmcsim::generatedRecords(2, 1, 0x60000000));
+    IpmiSession session(parameters());
+    const std::uint16_t first = session.reserveSel();
+    session.reserveSel(); // cancels the first
+    try
+    {
+        session.getSelEntry(first, firstRecordId);
+        FAIL() << "no error";
+    }
+    catch (const IpmiError& error)
+    {
+        EXPECT_EQ(error.category(), ErrorCategory::CompletionCode);
+        EXPECT_EQ(error.completionCode(), completionReservationCancelled);
+        EXPECT_THAT(error.what(), HasSubstr("ipmi_cmd_get_sel_entry: "
+                                            "completion code C5h"));
+    }
+    // A completion code leaves the session usable.
+    EXPECT_EQ(session.getSelInfo().entries, 2u);
+    EXPECT_EQ(session.sessionGeneration(), 1u);
+}
+
+TEST_F(SessionTest, WrongPasswordIsASessionError)
+{
+    SessionParameters wrong = parameters();
+    wrong.password = "not-the-password";
+    IpmiSession session(wrong);
+    try
+    {
+        session.getSelInfo();
+        FAIL() << "no error";
+    }
+    catch (const IpmiError& error)
+    {
+        EXPECT_EQ(error.category(), ErrorCategory::Session) << error.what();
+        EXPECT_THAT(error.what(),
+                    ::testing::Not(HasSubstr("not-the-password")));
+    }
+}
+
+TEST_F(SessionTest, FrozenBmcIsATimeoutWithinTheTimeoutAndThenRecovers)
+{
+    IpmiSession session(parameters(1000));
+    session.getSelInfo();
+    bmc->freeze();
+    const auto began = std::chrono::steady_clock::now();
+    try
+    {
+        session.getSelInfo();
+        ADD_FAILURE() << "no error";
+    }
+    catch (const IpmiError& error)
+    {
+        EXPECT_EQ(error.category(), ErrorCategory::Timeout) << error.what();
+    }
+    EXPECT_LT(std::chrono::steady_clock::now() - began,
+              std::chrono::milliseconds(2000));
+    bmc->thaw();
+    EXPECT_EQ(session.getSelInfo().entries, 0u);
+    EXPECT_EQ(session.sessionGeneration(), 2u);
+}
+
+TEST_F(SessionTest, GuardedExchangeGivesUpAtItsOwnTimeout)
+{
+    // As in-band: the helper thread may wait on far longer than the caller.
+    SessionParameters guarded = parameters(5000);
+    guarded.guardExchanges = true;
+    guarded.guardTimeoutMs = 400;
+    IpmiSession session(guarded);
+    EXPECT_EQ(session.getSelInfo().entries, 0u);
+
+    bmc->freeze();
+    const auto began = std::chrono::steady_clock::now();
+    try
+    {
+        session.getSelInfo();
+        ADD_FAILURE() << "no error";
+    }
+    catch (const IpmiError& error)
+    {
+        EXPECT_EQ(error.category(), ErrorCategory::Timeout) << error.what();
+    }
+    EXPECT_LT(std::chrono::steady_clock::now() - began,
+              std::chrono::milliseconds(1500));
+    // The helper is still inside FreeIPMI: no second exchange meanwhile.
+    try
+    {
+        session.getSelInfo();
+        ADD_FAILURE() << "no error";
+    }
+    catch (const IpmiError& error)
+    {
+        EXPECT_EQ(error.category(), ErrorCategory::Busy) << error.what();
+    }
+
+    bmc->thaw();
+    bool served = false;
+    for (int attempt = 0; attempt < 200 && !served; ++attempt)
+    {
+        try
+        {
+            served = session.getSelInfo().entries == 0;
+        }
+        catch (const IpmiError& error)
+        {
+            ASSERT_EQ(error.category(), ErrorCategory::Busy) << error.what();
+            std::this_thread::sleep_for(std::chrono::milliseconds(50));
+        }
+    }
+    EXPECT_TRUE(served);
+    EXPECT_EQ(session.sessionGeneration(), 2u);
+}
+
+} // namespace

@@ -1,0 +1,224 @@
+#pragma once
+
+// A simulated SEL behind the BMC command seam, counting every exchange,
+// with the faults real BMCs show: cancelled reservations, missing records,
+// ids that start again, refused commands.
+
+#include "ipmi/BmcCommands.h"
+#include "ipmi/IpmiError.h"
+#include "ipmi/RecordDescriber.h"
+
+#include <algorithm>
+#include <cstdint>
+#include <optional>
+#include <string>
+#include <utility>
+#include <vector>
+
+namespace QX::test
+{
+
+/** A system event record with id @p id, time @p time and sensor type
+ *  @p sensorType (temperature by default). */
+inline Ipmi::SelRecordBytes selRecord(std::uint16_t id,
+                                      std::uint32_t time = 0x65e5831a,
+                                      std::uint8_t sensorType = 0x01)
+{
+    return {static_cast<std::uint8_t>(id),
+            static_cast<std::uint8_t>(id >> 8),
+            0x02,
+            static_cast<std::uint8_t>(time),
+            static_cast<std::uint8_t>(time >> 8),
+            static_cast<std::uint8_t>(time >> 16),
+            static_cast<std::uint8_t>(time >> 24),
+            0x20,
+            0x00,
+            0x04,
+            sensorType,
+            0x30,
+            0x01,
+            0x57,
+            0x52,
+            0x50};
+}
+
+/** The "Log Area Reset/Cleared" record BMCs write after a clear. */
+inline Ipmi::SelRecordBytes logClearedRecord(std::uint16_t id)
+{
+    Ipmi::SelRecordBytes record = selRecord(id, 0x65e5831a, 0x10);
+    record[11] = 0x01;
+    record[12] = 0x6f;
+    record[13] = 0x02;
+    record[14] = 0xff;
+    record[15] = 0xff;
+    return record;
+}
+
+class FakeBmc : public Ipmi::BmcCommands
+{
+  public:
+    std::vector<Ipmi::SelRecordBytes> sel;
+    std::uint16_t freeSpace = 512 * 16;
+    std::uint32_t lastAddition = 0x65000000;
+    std::uint32_t lastErase = 0;
+    bool overflow = false;
+    std::optional<std::uint8_t> restartCause;
+    std::uint64_t generation = 1;
+
+    // Faults: cancel the reservation at the n-th Get SEL Entry from now
+    // (0: the next), or at every one.
+    std::optional<unsigned> cancelAtEntry;
+    bool cancelAlways = false;
+    // Makes every exchange throw this error.
+    std::optional<Ipmi::IpmiError> failure;
+
+    unsigned selInfoCalls = 0;
+    unsigned reserveCalls = 0;
+    unsigned entryCalls = 0;
+    unsigned eraseCalls = 0;
+    unsigned restartCauseCalls = 0;
+
+    void add(const Ipmi::SelRecordBytes& record)
+    {
+        sel.push_back(record);
+        ++lastAddition;
+        freeSpace = static_cast<std::uint16_t>(freeSpace - 16);
+    }
+    void resetCounters()
+    {
+        selInfoCalls = reserveCalls = entryCalls = eraseCalls =
+            restartCauseCalls = 0;
+    }
+    unsigned exchanges() const
+    {
+        return selInfoCalls + reserveCalls + entryCalls + eraseCalls +
+               restartCauseCalls;
+    }
+
+    Ipmi::SelInfo getSelInfo() override
+    {
+        fail();
+        ++selInfoCalls;
+        Ipmi::SelInfo info;
+        info.entries = static_cast<std::uint16_t>(sel.size());
+        info.freeSpace = freeSpace;
+        info.mostRecentAddition = lastAddition;
+        info.mostRecentErase = lastErase;
+        info.overflow = overflow;
+        info.reserveSupported = true;
+        return info;
+    }
+    std::uint16_t reserveSel() override
+    {
+        fail();
+        ++reserveCalls;
+        return ++reservation_;
+    }
+    Ipmi::SelEntry getSelEntry(std::uint16_t reservationId,
+                               std::uint16_t recordId) override
+    {
+        fail();
+        ++entryCalls;
+        const bool cancelNow =
+            cancelAlways || (cancelAtEntry && *cancelAtEntry == 0);
+        if (cancelAtEntry)
+        {
+            cancelAtEntry = *cancelAtEntry == 0
+                                ? std::nullopt
+                                : std::optional<unsigned>(*cancelAtEntry - 1);
+        }
+        if (cancelNow || reservationId != reservation_)
+        {
+            throw Ipmi::IpmiError(
+                "ipmi_cmd_get_sel_entry", Ipmi::ErrorCategory::CompletionCode,
+                "reservation cancelled", Ipmi::completionReservationCancelled);
+        }
+        auto found = sel.begin();
+        if (recordId != Ipmi::firstRecordId)
+        {
+            found = std::find_if(sel.begin(), sel.end(),
+                                 [recordId](const Ipmi::SelRecordBytes& r)
+                                 { return (r[0] | r[1] << 8) == recordId; });
+        }
+        if (found == sel.end())
+        {
+            throw Ipmi::IpmiError(
+                "ipmi_cmd_get_sel_entry", Ipmi::ErrorCategory::CompletionCode,
+                "record not present", Ipmi::completionRecordNotPresent);
+        }
+        Ipmi::SelEntry entry;
+        entry.data = *found;
+        const auto next = found + 1;
+        entry.nextRecordId =
+            next == sel.end()
+                ? Ipmi::lastRecordId
+                : static_cast<std::uint16_t>((*next)[0] | (*next)[1] << 8);
+        return entry;
+    }
+    void initiateSelErase(std::uint16_t reservationId) override
+    {
+        fail();
+        ++eraseCalls;
+        if (reservationId != reservation_)
+        {
+            throw Ipmi::IpmiError(
+                "ipmi_cmd_clear_sel", Ipmi::ErrorCategory::CompletionCode,
+                "reservation cancelled", Ipmi::completionReservationCancelled);
+        }
+        sel.clear();
+        ++lastErase;
+        freeSpace = 512 * 16;
+        overflow = false;
+    }
+    bool selEraseCompleted(std::uint16_t /*reservationId*/) override
+    {
+        fail();
+        ++eraseCalls;
+        return true;
+    }
+    std::optional<std::uint8_t> getSystemRestartCause() override
+    {
+        fail();
+        ++restartCauseCalls;
+        return restartCause;
+    }
+    std::uint64_t sessionGeneration() const override
+    {
+        return generation;
+    }
+    std::chrono::steady_clock::time_point lastActivity() const override
+    {
+        return std::chrono::steady_clock::now();
+    }
+
+  private:
+    void fail() const
+    {
+        if (failure)
+        {
+            throw *failure;
+        }
+    }
+
+    std::uint16_t reservation_ = 0;
+};
+
+/** Describes a record by its id; counts how often it was asked. */
+class CountingDescriber : public Ipmi::RecordDescriber
+{
+  public:
+    bool namesChanged = false;
+    unsigned described = 0;
+
+    bool refreshSensorNames() override
+    {
+        return std::exchange(namesChanged, false);
+    }
+    std::string describe(const Ipmi::SelRecordBytes& record) override
+    {
+        ++described;
+        return "event " + std::to_string(record[0] | record[1] << 8);
+    }
+};
+
+} // namespace QX::test

@@ -1,0 +1,234 @@
+#include "CVLogger.h"
+#include "Platform.h"
+#include "ipmi/IpmiSourceFactory.h"
+
+#include <cstdio>
+#include <fstream>
+#include <sys/stat.h>
+#include <unistd.h>
+
+#include <gmock/gmock.h>
+#include <gtest/gtest.h>
+
+using namespace QX;
+using ::testing::HasSubstr;
+using ::testing::Not;
+
+namespace
+{
+
+constexpr const char* secret = "s3cr3t-pw";
+
+/** A file with @p text and @p mode, removed at the end of the test. */
+class ModeFile
+{
+  public:
+    ModeFile(const std::string& text, mode_t mode)
+    {
+        char name[] = "/tmp/qx-ipmi-settings-XXXXXX";
+        const int fd = mkstemp(name);
+        if (fd < 0)
+        {
+            throw std::runtime_error("mkstemp failed");
+        }
+        close(fd);
+        path_ = name;
+        std::ofstream(path_) << text;
+        chmod(path_.c_str(), mode);
+    }
+    ~ModeFile()
+    {
+        std::remove(path_.c_str());
+    }
+    const std::string& path() const
+    {
+        return path_;
+    }
+
+  private:
+    std::string path_;
+};
+
+std::string refusal(const std::string& configurationText,
+                    const std::string& file)
+{
+    try
+    {
+        const Platform::Configuration configuration =
+            Platform::parseConfiguration(configurationText, file);
+        Ipmi::makeIpmiSource(configuration.ipmi, file);
+    }
+    catch (const std::exception& error)
+    {
+        return error.what();
+    }
+    return "";
+}
+
+class IpmiSettingsTest : public ::testing::Test
+{
+  protected:
+    void SetUp() override
+    {
+        previous_ = CVLog::CVLogger::setSink(capture);
+    }
+    void TearDown() override
+    {
+        CVLog::CVLogger::setSink(previous_);
+    }
+    /** Every logged line, for checks that the password is not among them. */
+    std::string logged() const
+    {
+        std::string all;
+        for (const auto& record : capture->records())
+        {
+            all += record.message + "\n";
+        }
+        return all;
+    }
+
+    std::shared_ptr<CVLog::CaptureSink> capture =
+        std::make_shared<CVLog::CaptureSink>();
+
+  private:
+    std::shared_ptr<CVLog::LogSink> previous_;
+};
+
+TEST_F(IpmiSettingsTest, EveryKeyIsParsed)
+{
+    const auto configuration = Platform::parseConfiguration(
+        "source = ipmi\n"
+        "ipmi.interface = lan\n"
+        "ipmi.host = 10.0.0.5:6623\n"
+        "ipmi.user = monitor\n"
+        "ipmi.password-file = /etc/qx/bmc.pw\n"
+        "ipmi.privilege = admin\n"
+        "ipmi.cipher-suite = 17\n"
+        "ipmi.workarounds = opensesspriv, authcap\n"
+        "ipmi.timeout = 3000\n"
+        "ipmi.retransmission-timeout = 300\n"
+        "ipmi.sel-warning-fill = 80\n"
+        "ipmi.sel-clock = local\n"
+        "ipmi.sel-capacity = 8192\n"
+        "ipmi.sel-wraps = yes\n"
+        "ipmi.state-directory = /var/lib/qx\n",
+        "platform.conf");
+    const Ipmi::Settings& ipmi = configuration.ipmi;
+    EXPECT_EQ(configuration.source, "ipmi");
+    EXPECT_EQ(ipmi.interface, Ipmi::Interface::Lan);
+    EXPECT_EQ(ipmi.host, "10.0.0.5:6623");
+    EXPECT_EQ(ipmi.user, "monitor");
+    EXPECT_EQ(ipmi.passwordFile, "/etc/qx/bmc.pw");
+    EXPECT_EQ(ipmi.privilege, "admin");
+    EXPECT_EQ(ipmi.cipherSuite, 17u);
+    EXPECT_EQ(ipmi.workarounds,
+              (std::vector<std::string>{"opensesspriv", "authcap"}));
+    EXPECT_EQ(ipmi.timeoutMs, 3000u);
+    EXPECT_EQ(ipmi.retransmissionTimeoutMs, 300u);
+    EXPECT_EQ(ipmi.warningFillPercent, 80u);
+    EXPECT_EQ(ipmi.selClock, Ipmi::SelClock::Local);
+    EXPECT_EQ(ipmi.selCapacity, 8192u);
+    EXPECT_TRUE(ipmi.selWraps);
+    EXPECT_EQ(ipmi.stateDirectory, "/var/lib/qx");
+}
+
+TEST_F(IpmiSettingsTest, BadValuesNameTheKey)
+{
+    const auto error = [](const std::string& text)
+    {
+        try
+        {
+            Platform::parseConfiguration(text, "platform.conf");
+        }
+        catch (const std::runtime_error& failure)
+        {
+            return std::string(failure.what());
+        }
+        return std::string();
+    };
+    EXPECT_EQ(error("ipmi.interface = serial\n"),
+              "platform.conf:1: ipmi.interface must be inband or lan, not "
+              "\"serial\"");
+    EXPECT_THAT(error("ipmi.timeout = 5s\n"),
+                HasSubstr("ipmi.timeout must be a whole number"));
+    EXPECT_EQ(error("ipmi.workarounds = nosuch\n"),
+              "platform.conf:1: ipmi.workarounds: unknown workaround "
+              "\"nosuch\"");
+    EXPECT_EQ(error("ipmi.colour = blue\n"),
+              "platform.conf:1: unknown key \"ipmi.colour\"");
+}
+
+TEST_F(IpmiSettingsTest, PasswordNeverAppearsInErrors)
+{
+    const auto error = [](const std::string& text)
+    {
+        try
+        {
+            Platform::parseConfiguration(text, "platform.conf");
+        }
+        catch (const std::runtime_error& failure)
+        {
+            return std::string(failure.what());
+        }
+        return std::string();
+    };
+    EXPECT_EQ(error("ipmi.password = 123456789012345678901\n"),
+              "platform.conf:1: ipmi.password is longer than 20 bytes");
+    EXPECT_EQ(error(std::string("ipmi.password ") + secret + "\n"),
+              "platform.conf:1: expected key = value");
+}
+
+TEST_F(IpmiSettingsTest, ConfigurationWithAPasswordMustBePrivate)
+{
+    const std::string text = std::string("source = ipmi\n"
+                                         "ipmi.interface = lan\n"
+                                         "ipmi.host = 127.0.0.1:1\n"
+                                         "ipmi.password = ") +
+                             secret + "\n";
+    const ModeFile readable(text, 0644);
+    const std::string why = refusal(text, readable.path());
+    EXPECT_THAT(why, HasSubstr("holds an IPMI password but group or others "
+                               "may read it (mode 0644): refused"));
+    EXPECT_THAT(why, Not(HasSubstr(secret)));
+    EXPECT_THAT(logged(), HasSubstr("IPMI instrumentation refused"));
+    EXPECT_THAT(logged(), Not(HasSubstr(secret)));
+
+    const ModeFile private_(text, 0600);
+    EXPECT_EQ(refusal(text, private_.path()), "");
+    EXPECT_THAT(logged(), Not(HasSubstr(secret)));
+}
+
+TEST_F(IpmiSettingsTest, PasswordFileMustBePrivate)
+{
+    const ModeFile password(std::string(secret) + "\n", 0640);
+    const std::string text = "source = ipmi\n"
+                             "ipmi.interface = lan\n"
+                             "ipmi.host = 127.0.0.1:1\n"
+                             "ipmi.password-file = " +
+                             password.path() + "\n";
+    EXPECT_THAT(refusal(text, ""),
+                HasSubstr("password file " + password.path() +
+                          " holds an IPMI password"));
+    chmod(password.path().c_str(), 0400);
+    EXPECT_EQ(refusal(text, ""), "");
+    EXPECT_THAT(logged(), Not(HasSubstr(secret)));
+}
+
+TEST_F(IpmiSettingsTest, InterfaceAndHostMustAgree)
+{
+    EXPECT_EQ(refusal("ipmi.interface = lan\n", ""),
+              "ipmi.interface is lan but ipmi.host is not set");
+    EXPECT_THAT(refusal("ipmi.host = bmc\n", ""),
+                HasSubstr("ipmi.host is set but ipmi.interface is inband"));
+    EXPECT_THAT(refusal("ipmi.interface = lan\nipmi.host = h\n"
+                        "ipmi.workarounds = spinpoll\n",
+                        ""),
+                HasSubstr("spinpoll does not apply to the LAN interface"));
+    EXPECT_THAT(refusal("ipmi.interface = lan\nipmi.host = h\n"
+                        "ipmi.timeout = 500\n"
+                        "ipmi.retransmission-timeout = 500\n",
+                        ""),
+                HasSubstr("ipmi.retransmission-timeout must be below"));
+}
+
+} // namespace

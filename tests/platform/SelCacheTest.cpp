@@ -1,0 +1,226 @@
+#include "ipmi/SelCache.h"
+
+#include "platform/FakeBmc.h"
+
+#include <gtest/gtest.h>
+
+using namespace QX;
+using namespace QX::Ipmi;
+using QX::test::CountingDescriber;
+using QX::test::FakeBmc;
+using QX::test::selRecord;
+
+namespace
+{
+
+std::vector<std::uint16_t> ids(const SelCache& cache)
+{
+    std::vector<std::uint16_t> result;
+    for (const CachedRecord& record : cache.records())
+    {
+        result.push_back(record.id);
+    }
+    return result;
+}
+
+class SelCacheTest : public ::testing::Test
+{
+  protected:
+    void fill(unsigned count, std::uint16_t firstId = 1)
+    {
+        for (unsigned i = 0; i < count; ++i)
+        {
+            bmc.add(selRecord(static_cast<std::uint16_t>(firstId + i)));
+        }
+    }
+
+    FakeBmc bmc;
+    CountingDescriber describer;
+    SelCache cache;
+};
+
+TEST_F(SelCacheTest, FirstRefreshReadsTheWholeSel)
+{
+    fill(5);
+    EXPECT_EQ(cache.refresh(bmc, describer), SelChange::Replaced);
+    EXPECT_EQ(ids(cache), (std::vector<std::uint16_t>{1, 2, 3, 4, 5}));
+    EXPECT_EQ(cache.records()[2].bytes, selRecord(3));
+    EXPECT_EQ(cache.records()[2].description, "event 3");
+    EXPECT_EQ(cache.info().entries, 5u);
+    EXPECT_EQ(bmc.entryCalls, 5u);
+}
+
+TEST_F(SelCacheTest, UnchangedSelCostsOneGetSelInfo)
+{
+    fill(50);
+    cache.refresh(bmc, describer);
+    bmc.resetCounters();
+    const unsigned describedBefore = describer.described;
+    EXPECT_EQ(cache.refresh(bmc, describer), SelChange::None);
+    EXPECT_EQ(bmc.selInfoCalls, 1u);
+    EXPECT_EQ(bmc.exchanges(), 1u);
+    EXPECT_EQ(describer.described, describedBefore);
+}
+
+TEST_F(SelCacheTest, AddedRecordsAreTheOnlyOnesRead)
+{
+    fill(50);
+    cache.refresh(bmc, describer);
+    fill(3, 51);
+    bmc.resetCounters();
+    EXPECT_EQ(cache.refresh(bmc, describer), SelChange::Appended);
+    EXPECT_EQ(cache.firstNew(), 50u);
+    ASSERT_EQ(cache.records().size(), 53u);
+    EXPECT_EQ(cache.records().back().id, 53u);
+    // The last known record once more, then the three new ones.
+    EXPECT_EQ(bmc.entryCalls, 4u);
+    EXPECT_EQ(bmc.selInfoCalls, 1u);
+}
+
+TEST_F(SelCacheTest, AnEraseReadsEverythingAgain)
+{
+    fill(5);
+    cache.refresh(bmc, describer);
+    bmc.sel.clear();
+    ++bmc.lastErase;
+    fill(7, 6);
+    EXPECT_EQ(cache.refresh(bmc, describer), SelChange::Replaced);
+    EXPECT_EQ(ids(cache), (std::vector<std::uint16_t>{6, 7, 8, 9, 10, 11, 12}));
+}
+
+TEST_F(SelCacheTest, AChangedLastRecordReadsEverythingAgain)
+{
+    fill(5);
+    cache.refresh(bmc, describer);
+    bmc.sel.back() = selRecord(5, 0x66000000);
+    fill(1, 6);
+    EXPECT_EQ(cache.refresh(bmc, describer), SelChange::Replaced);
+    EXPECT_EQ(cache.records()[4].bytes, selRecord(5, 0x66000000));
+}
+
+TEST_F(SelCacheTest, ANewSessionChecksTheLastRecord)
+{
+    fill(5);
+    cache.refresh(bmc, describer);
+    ++bmc.generation;
+    bmc.resetCounters();
+    EXPECT_EQ(cache.refresh(bmc, describer), SelChange::None);
+    EXPECT_EQ(bmc.entryCalls, 1u);
+
+    // Same counts and times, other content: read again.
+    ++bmc.generation;
+    bmc.sel.back() = selRecord(5, 0x66000000);
+    EXPECT_EQ(cache.refresh(bmc, describer), SelChange::Replaced);
+    EXPECT_EQ(cache.records()[4].bytes, selRecord(5, 0x66000000));
+}
+
+TEST_F(SelCacheTest, CancelledReservationMidWalkRestartsTheWalk)
+{
+    fill(10);
+    bmc.cancelAtEntry = 4;
+    EXPECT_EQ(cache.refresh(bmc, describer), SelChange::Replaced);
+    EXPECT_EQ(cache.records().size(), 10u);
+    EXPECT_EQ(bmc.reserveCalls, 2u);
+    EXPECT_EQ(bmc.entryCalls, 15u);
+}
+
+TEST_F(SelCacheTest, ReservationCancelledOnEveryWalkGivesUp)
+{
+    fill(10);
+    bmc.cancelAlways = true;
+    try
+    {
+        cache.refresh(bmc, describer);
+        FAIL() << "no error";
+    }
+    catch (const IpmiError& error)
+    {
+        EXPECT_EQ(error.completionCode(), completionReservationCancelled);
+    }
+    EXPECT_EQ(bmc.reserveCalls, SelCache::walkAttempts);
+    // Nothing was taken from the failed walks; the next refresh reads all.
+    EXPECT_TRUE(cache.records().empty());
+    bmc.cancelAlways = false;
+    EXPECT_EQ(cache.refresh(bmc, describer), SelChange::Replaced);
+    EXPECT_EQ(cache.records().size(), 10u);
+}
+
+TEST_F(SelCacheTest, CancelledReservationWhileReadingAdditionsReadsAll)
+{
+    fill(5);
+    cache.refresh(bmc, describer);
+    fill(2, 6);
+    bmc.cancelAtEntry = 1;
+    EXPECT_EQ(cache.refresh(bmc, describer), SelChange::Replaced);
+    EXPECT_EQ(cache.records().size(), 7u);
+}
+
+TEST_F(SelCacheTest, IdsStartingAgainCountRuns)
+{
+    fill(3, 5001);
+    fill(2, 1);
+    cache.refresh(bmc, describer);
+    ASSERT_EQ(ids(cache), (std::vector<std::uint16_t>{5001, 5002, 5003, 1, 2}));
+    std::vector<std::uint32_t> runs;
+    for (const CachedRecord& record : cache.records())
+    {
+        runs.push_back(record.run);
+    }
+    EXPECT_EQ(runs, (std::vector<std::uint32_t>{0, 0, 0, 1, 1}));
+
+    // Records added later continue the run of the last one.
+    fill(1, 3);
+    EXPECT_EQ(cache.refresh(bmc, describer), SelChange::Appended);
+    EXPECT_EQ(cache.records().back().run, 1u);
+}
+
+TEST_F(SelCacheTest, ALoopingNextRecordChainIsRefused)
+{
+    // Two records that name each other as next, forever.
+    class LoopingBmc : public FakeBmc
+    {
+      public:
+        SelEntry getSelEntry(std::uint16_t reservation,
+                             std::uint16_t recordId) override
+        {
+            SelEntry entry = FakeBmc::getSelEntry(reservation, recordId);
+            entry.nextRecordId = recordId == 2 ? 1 : 2;
+            return entry;
+        }
+    } looping;
+    looping.add(selRecord(1));
+    looping.add(selRecord(2));
+    EXPECT_THROW(cache.refresh(looping, describer), IpmiError);
+    EXPECT_LE(looping.entryCalls, 0x10000u);
+}
+
+TEST_F(SelCacheTest, NewSensorNamesDescribeEveryRecordAgain)
+{
+    fill(4);
+    cache.refresh(bmc, describer);
+    describer.namesChanged = true;
+    const unsigned before = describer.described;
+    EXPECT_EQ(cache.refresh(bmc, describer), SelChange::Replaced);
+    EXPECT_EQ(describer.described, before + 4);
+}
+
+TEST_F(SelCacheTest, AnEmptySelNeedsNoWalk)
+{
+    EXPECT_EQ(cache.refresh(bmc, describer), SelChange::Replaced);
+    EXPECT_TRUE(cache.records().empty());
+    EXPECT_EQ(bmc.entryCalls, 0u);
+}
+
+TEST_F(SelCacheTest, AFailedRefreshLeavesTheCopy)
+{
+    fill(3);
+    cache.refresh(bmc, describer);
+    bmc.failure.emplace("ipmi_cmd_get_sel_info", ErrorCategory::Timeout,
+                        "session timeout");
+    EXPECT_THROW(cache.refresh(bmc, describer), IpmiError);
+    EXPECT_EQ(cache.records().size(), 3u);
+    bmc.failure.reset();
+    EXPECT_EQ(cache.refresh(bmc, describer), SelChange::None);
+}
+
+} // namespace
