@@ -1,5 +1,7 @@
 #include "BrokerState.h"
 
+#include "Names.h"
+
 #include <algorithm>
 
 namespace host::detail
@@ -62,6 +64,10 @@ ContextObject::~ContextObject()
     broker->unregisterContext(&cmpi);
 }
 
+// Longest a broker waits, when it is destroyed, for threads a provider
+// started through it and that still run.
+constexpr std::chrono::seconds threadDrainLimit{10};
+
 BrokerState::BrokerState(Schema s) : schema(std::move(s))
 {
     cmpi.hdl = this;
@@ -69,12 +75,18 @@ BrokerState::BrokerState(Schema s) : schema(std::move(s))
     cmpi.eft = &brokerEncFT;
     cmpi.xft = &brokerExtFT;
     cmpi.mft = nullptr;
+    for (CMPIBroker& view : otherViews)
+    {
+        view = cmpi;
+    }
     const std::lock_guard lock(liveMutex);
     liveBrokers.push_back(this);
 }
 
 BrokerState::~BrokerState()
 {
+    // A provider thread still running would use what is freed below.
+    waitForThreads(threadDrainLimit);
     {
         const std::lock_guard lock(liveMutex);
         std::erase(liveBrokers, this);
@@ -200,10 +212,78 @@ CMPIStatus BrokerState::detach(const CMPIContext* ctx)
                     doomed.splice(doomed.begin(), attachArenas, found);
                 }
             }
+            ContextObject* context = ContextObject::of(ctx);
+            if (context != nullptr && context->ownership == Ownership::Prepared)
+            {
+                release(context);
+            }
             break;
         }
     }
     return okStatus();
+}
+
+bool BrokerState::inScopeOnThisThread() const
+{
+    return std::any_of(scopes.begin(), scopes.end(),
+                       [this](const Scope& s) { return s.broker == this; });
+}
+
+void BrokerState::deliver(DeliveredIndication indication)
+{
+    const std::lock_guard lock(indicationMutex);
+    ++deliveredCount;
+    std::vector<std::shared_ptr<InboxState>> listeners;
+    std::erase_if(inboxes,
+                  [&](const std::weak_ptr<InboxState>& weak)
+                  {
+                      auto inbox = weak.lock();
+                      if (!inbox)
+                      {
+                          return true;
+                      }
+                      if (sameName(inbox->nameSpace, indication.nameSpace))
+                      {
+                          listeners.push_back(std::move(inbox));
+                      }
+                      return false;
+                  });
+    if (listeners.empty())
+    {
+        ++unheardCount;
+        return;
+    }
+    for (const auto& inbox : listeners)
+    {
+        {
+            const std::lock_guard inboxLock(inbox->mutex);
+            inbox->queue.push_back(indication);
+            ++inbox->received;
+        }
+        inbox->arrived.notify_all();
+    }
+}
+
+void BrokerState::threadStarted()
+{
+    const std::lock_guard lock(threadMutex);
+    ++liveThreads;
+}
+
+void BrokerState::threadEnded()
+{
+    // Notified under the lock: the broker may be destroyed as soon as the
+    // waiter sees the count reach 0.
+    const std::lock_guard lock(threadMutex);
+    --liveThreads;
+    threadsDone.notify_all();
+}
+
+bool BrokerState::waitForThreads(std::chrono::milliseconds timeout)
+{
+    std::unique_lock lock(threadMutex);
+    return threadsDone.wait_for(lock, timeout,
+                                [this] { return liveThreads == 0; });
 }
 
 void BrokerState::registerContext(const CMPIContext* ctx)
