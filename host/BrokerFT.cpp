@@ -45,7 +45,13 @@ CMPIStatus attachThread(const CMPIBroker* mb, const CMPIContext* ctx)
 CMPIStatus detachThread(const CMPIBroker* mb, const CMPIContext* ctx)
 {
     BrokerState* b = BrokerState::of(mb);
-    return b ? b->detach(ctx) : errorStatus(CMPI_RC_ERR_INVALID_HANDLE);
+    if (b == nullptr)
+    {
+        return errorStatus(CMPI_RC_ERR_INVALID_HANDLE);
+    }
+    const bool fails = b->fault(BrokerCall::DetachThread).has_value();
+    const CMPIStatus status = b->detach(ctx);
+    return fails ? errorStatus(CMPI_RC_ERR_FAILED) : status;
 }
 
 CMPIStatus deliverIndication(const CMPIBroker* mb, const CMPIContext* ctx,

@@ -246,6 +246,16 @@ TEST_F(FaultTest, DeliverIndication)
     EXPECT_EQ(broker_.faults().calls(BrokerCall::DeliverIndication), 2u);
 }
 
+TEST_F(FaultTest, DetachThreadIsCountedAndStillDetaches)
+{
+    CMPIContext* prepared = mb()->bft->prepareAttachThread(mb(), context());
+    ASSERT_EQ(mb()->bft->attachThread(mb(), prepared).rc, CMPI_RC_OK);
+    broker_.faults().fail(BrokerCall::DetachThread);
+    EXPECT_EQ(mb()->bft->detachThread(mb(), prepared).rc, CMPI_RC_ERR_FAILED);
+    EXPECT_EQ(broker_.outstandingPreparedContexts(), 0u);
+    EXPECT_EQ(broker_.faults().calls(BrokerCall::DetachThread), 1u);
+}
+
 TEST_F(FaultTest, NullHandleObjectsAreRejectedByTheirFunctions)
 {
     broker_.faults().fail(BrokerCall::NewInstance, FaultMode::NullHandle);
