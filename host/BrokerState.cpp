@@ -3,6 +3,9 @@
 #include "Names.h"
 
 #include <algorithm>
+#include <array>
+#include <iterator>
+#include <stdexcept>
 
 namespace host::detail
 {
@@ -16,8 +19,67 @@ struct Scope
     const CMPIContext* attached;
 };
 
-// Innermost last. A request or an attachment is open on one thread only.
-thread_local std::vector<Scope> scopes;
+// The requests and attachments open on one thread, innermost last. Of
+// fixed capacity and trivially destructible: a thread's first use of a
+// thread_local that needs a destructor registers it under the dynamic
+// loader's lock, and a provider's thread may get here while its library
+// is being unloaded under that very lock.
+class ScopeStack
+{
+  public:
+    static constexpr std::size_t capacity = 64;
+
+    Scope* begin()
+    {
+        return entries_.data();
+    }
+    Scope* end()
+    {
+        return entries_.data() + depth_;
+    }
+    std::reverse_iterator<Scope*> rbegin()
+    {
+        return std::reverse_iterator<Scope*>(end());
+    }
+    std::reverse_iterator<Scope*> rend()
+    {
+        return std::reverse_iterator<Scope*>(begin());
+    }
+    bool empty() const
+    {
+        return depth_ == 0;
+    }
+    const Scope& back() const
+    {
+        return entries_[depth_ - 1];
+    }
+    bool push(const Scope& scope)
+    {
+        if (depth_ == capacity)
+        {
+            return false;
+        }
+        entries_[depth_++] = scope;
+        return true;
+    }
+    void erase(Scope* at)
+    {
+        std::copy(at + 1, end(), at);
+        --depth_;
+    }
+    template <typename Predicate>
+    void eraseIf(Predicate predicate)
+    {
+        depth_ = static_cast<std::size_t>(
+            std::remove_if(begin(), end(), predicate) - begin());
+    }
+
+  private:
+    std::array<Scope, capacity> entries_;
+    std::size_t depth_;
+};
+
+thread_local ScopeStack scopes{};
 
 std::mutex liveMutex;
 std::vector<BrokerState*> liveBrokers;
@@ -103,7 +165,7 @@ BrokerState::~BrokerState()
     }
     doomed.clear();
     // Drop any scope this thread still has for this broker.
-    std::erase_if(scopes, [this](const Scope& s) { return s.broker == this; });
+    scopes.eraseIf([this](const Scope& s) { return s.broker == this; });
 }
 
 BrokerState* BrokerState::of(const CMPIBroker* mb)
@@ -159,7 +221,10 @@ Arena& BrokerState::currentArena()
 
 void BrokerState::pushScope(Arena* arena, const CMPIContext* attached)
 {
-    scopes.push_back({this, arena, attached});
+    if (!scopes.push({this, arena, attached}))
+    {
+        throw std::length_error("too many nested requests on one thread");
+    }
 }
 
 void BrokerState::popScope(Arena* arena)
@@ -185,7 +250,12 @@ CMPIStatus BrokerState::attach(const CMPIContext* ctx)
         const std::lock_guard lock(attachMutex);
         arena = &attachArenas.emplace_back();
     }
-    pushScope(arena, ctx);
+    if (!scopes.push({this, arena, ctx}))
+    {
+        const std::lock_guard lock(attachMutex);
+        attachArenas.remove_if([arena](const Arena& a) { return &a == arena; });
+        return errorStatus(CMPI_RC_ERR_FAILED);
+    }
     return okStatus();
 }
 

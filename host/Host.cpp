@@ -395,7 +395,10 @@ Outcome Host::enableIndications()
     Broker::Request request(broker_);
     Outcome out = request.finish(
         indicationMI_->ft->enableIndications(indicationMI_, request.context()));
-    indicationsEnabled_ = indicationsEnabled_ || out.rc == CMPI_RC_OK;
+    if (out.rc == CMPI_RC_OK)
+    {
+        indicationsEnabled_ = true;
+    }
     return out;
 }
 

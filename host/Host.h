@@ -8,6 +8,7 @@
 
 #include <cmpift.h>
 
+#include <atomic>
 #include <memory>
 #include <string>
 #include <vector>
@@ -125,7 +126,8 @@ class Host
     CMPIMethodMI* methodMI_ = nullptr;
     CMPIIndicationMI* indicationMI_ = nullptr;
     bool terminated_ = false;
-    bool indicationsEnabled_ = false;
+    // Enable and disable may come from different threads.
+    std::atomic<bool> indicationsEnabled_{false};
 };
 
 } // namespace host

@@ -38,10 +38,21 @@ void ActivityLedger::handlerLeft() noexcept
     idle_.notify_all();
 }
 
-void ActivityLedger::threadStarting()
+bool ActivityLedger::threadStarting()
 {
     const std::lock_guard lock(mutex_);
+    if (closed_)
+    {
+        return false;
+    }
     ++threads_;
+    return true;
+}
+
+void ActivityLedger::closeForUnload()
+{
+    const std::lock_guard lock(mutex_);
+    closed_ = true;
 }
 
 void ActivityLedger::threadNotStarted() noexcept

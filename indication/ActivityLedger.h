@@ -26,11 +26,22 @@ class ActivityLedger
     void handlerEntered();
     void handlerLeft() noexcept;
 
-    void threadStarting();
+    /**
+     * @brief Counts a delivery thread about to be created; false once the
+     *        library is being unloaded, when no thread may be started.
+     *
+     * A thread created while the library is unloaded could find the
+     * dynamic loader's lock taken by the unloading and could then not get
+     * out of this library's code before it is unmapped.
+     */
+    bool threadStarting();
     /** The thread could not be created. */
     void threadNotStarted() noexcept;
     /** Called by the thread as the very last thing it does in its body. */
     void threadFinishing() noexcept;
+
+    /** From now on no delivery thread starts (see threadStarting). */
+    void closeForUnload();
 
     /** Handlers and delivery threads counted now. */
     std::size_t active() const;
@@ -45,6 +56,7 @@ class ActivityLedger
     std::condition_variable idle_;
     std::size_t handlers_ = 0;
     std::size_t threads_ = 0;
+    bool closed_ = false;
     std::vector<pid_t> ending_; // finished delivery threads, maybe still alive
 };
 

@@ -109,20 +109,22 @@ void startDeliveryThread(const AlertChain& chain, const DateTime& time,
     {
         broker->bft->attachThread(broker, context);
     }
-    indicationActivity.threadStarting();
-    CMPI_THREAD_TYPE const handle =
-        broker->xft != nullptr
-            ? broker->xft->newThread(chain.threadBody, nullptr, 1)
-            : nullptr;
+    CMPI_THREAD_TYPE handle = nullptr;
+    if (indicationActivity.threadStarting())
+    {
+        handle = broker->xft != nullptr
+                     ? broker->xft->newThread(chain.threadBody, nullptr, 1)
+                     : nullptr;
+        if (handle != nullptr)
+        {
+            pending.threadStarted();
+        }
+        else
+        {
+            indicationActivity.threadNotStarted();
+        }
+    }
     chain.handle->store(handle);
-    if (handle != nullptr)
-    {
-        pending.threadStarted();
-    }
-    else
-    {
-        indicationActivity.threadNotStarted();
-    }
     if (context != nullptr)
     {
         broker->bft->detachThread(broker, context);

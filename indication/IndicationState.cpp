@@ -49,6 +49,7 @@ struct UnloadGuard
     UnloadGuard& operator=(const UnloadGuard&) = delete;
     ~UnloadGuard()
     {
+        indicationActivity.closeForUnload();
         indicationWatches.releaseAll();
         indicationActivity.awaitIdle(unloadWait);
     }
