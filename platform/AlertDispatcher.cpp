@@ -208,8 +208,8 @@ void AlertDispatcher::post(std::vector<PendingAlert> alerts)
             thread_ = std::thread([state = state_] { state->run(); });
             state_->dispatcher = thread_.get_id();
         }
+        state_->wake.notify_one();
     }
-    state_->wake.notify_one();
 }
 
 bool AlertDispatcher::waitIdle(std::chrono::milliseconds timeout) const

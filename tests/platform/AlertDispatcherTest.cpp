@@ -174,24 +174,40 @@ TEST_F(AlertDispatcherTest, DestroyingTheSourceWaitsForItsCallback)
 }
 
 std::atomic<std::shared_ptr<MemorySource>*> lastReference{nullptr};
+std::atomic<bool> callerLetGo{false};
+std::atomic<bool> dropped{false};
 
 void dropTheSource(unsigned, DateTime, std::string, const void*)
 {
+    // Wait until the raising side no longer holds the source, so that the
+    // reference dropped here is the last one.
+    while (!callerLetGo)
+    {
+        std::this_thread::yield();
+    }
     lastReference.load()->reset();
+    dropped = true;
 }
 
 TEST_F(AlertDispatcherTest, TheLastReferenceMayGoInsideACallback)
 {
     auto held = std::make_shared<MemorySource>(test::twoControllerTree());
     lastReference = &held;
-    held->startMonitoring(Watchdog, &dropTheSource, nullptr);
+    callerLetGo = false;
+    dropped = false;
     std::weak_ptr<MemorySource> watch = held;
-    held->raiseAlert("/bmc0/wdt", DateTime());
+    {
+        auto raiser = held;
+        raiser->startMonitoring(Watchdog, &dropTheSource, nullptr);
+        raiser->raiseAlert("/bmc0/wdt", DateTime());
+    }
+    callerLetGo = true;
     const auto deadline = std::chrono::steady_clock::now() + patience;
-    while (!watch.expired() && std::chrono::steady_clock::now() < deadline)
+    while (!dropped && std::chrono::steady_clock::now() < deadline)
     {
         std::this_thread::sleep_for(std::chrono::milliseconds(1));
     }
+    ASSERT_TRUE(dropped);
     EXPECT_TRUE(watch.expired());
     lastReference = nullptr;
 }
