@@ -30,3 +30,17 @@ echo
 echo "\$ selprov batch  (clear-log, then enumerate-names ZAN_MgmtHwLogEntry)"
 printf 'clear-log\nenumerate-names ZAN_MgmtHwLogEntry\nenumerate ZAN_MgmtHwLog --properties CurrentNumberOfRecords\n' |
     "$selprov" batch
+
+# ---------------------------------------------------------------------------
+# Indications, on the in-memory sample SEL whatever else the platform is
+# configured for: subscribe to the four indication classes, have the
+# simulated BMC raise each kind of alert, print the indications as they
+# arrive, then unsubscribe.
+# ---------------------------------------------------------------------------
+memory_conf=$(mktemp)
+trap 'rm -f "$memory_conf"' EXIT
+printf 'source = memory\nlog.sink = none\n' >"$memory_conf"
+echo
+echo "\$ selprov --config memory.conf watch --raise entry,clear,warning,full,restart --count 5 --timeout 30"
+"$selprov" --config "$memory_conf" watch --raise entry,clear,warning,full,restart \
+    --count 5 --timeout 30
