@@ -52,16 +52,44 @@ std::vector<LogRecord> Broker::logs() const
     return state_->logs;
 }
 
-std::vector<DeliveredIndication> Broker::indications() const
+const CMPIBroker* Broker::cmpiView(std::size_t index) const
 {
-    const std::lock_guard lock(state_->indicationMutex);
-    return state_->indications;
+    if (index == 0)
+    {
+        return &state_->cmpi;
+    }
+    return &state_->otherViews.at(index - 1);
 }
 
-void Broker::clearIndications()
+IndicationInbox Broker::listen(std::string nameSpace)
+{
+    auto inbox = std::make_shared<InboxState>(std::move(nameSpace));
+    const std::lock_guard lock(state_->indicationMutex);
+    state_->inboxes.push_back(inbox);
+    return IndicationInbox(std::move(inbox));
+}
+
+std::size_t Broker::deliveredIndications() const
 {
     const std::lock_guard lock(state_->indicationMutex);
-    state_->indications.clear();
+    return state_->deliveredCount;
+}
+
+std::size_t Broker::unheardIndications() const
+{
+    const std::lock_guard lock(state_->indicationMutex);
+    return state_->unheardCount;
+}
+
+std::size_t Broker::runningThreads() const
+{
+    const std::lock_guard lock(state_->threadMutex);
+    return state_->liveThreads;
+}
+
+bool Broker::waitForThreads(std::chrono::milliseconds timeout)
+{
+    return state_->waitForThreads(timeout);
 }
 
 namespace
@@ -152,6 +180,15 @@ CMPIArgs* Broker::makeArgs(const NamedValues& args)
     auto* a = state_->make<ArgsObject>();
     a->args = args;
     return &a->cmpi;
+}
+
+CMPISelectExp* Broker::makeSelectExp(const std::string& query,
+                                     const std::string& language)
+{
+    auto* e = state_->make<SelectExpObject>();
+    e->query = query;
+    e->language = language;
+    return &e->cmpi;
 }
 
 Instance Broker::toInstance(const CMPIInstance* instance)

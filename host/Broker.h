@@ -1,14 +1,17 @@
 #pragma once
 
 #include "Faults.h"
+#include "IndicationInbox.h"
 #include "Outcome.h"
 #include "Schema.h"
 #include "Values.h"
 
 #include <cmpift.h>
 
+#include <chrono>
 #include <cstddef>
 #include <memory>
+#include <string>
 #include <vector>
 
 namespace host
@@ -26,24 +29,42 @@ struct ResultObject;
 // memory handled like SFCB and OpenPegasus handle it. Objects made while a
 // Request is open on the calling thread (or while the thread is attached
 // to a broker-made context) are freed when it closes (or detaches);
-// others live as long as the broker. Thread-safe.
+// others live as long as the broker. Thread-safe. Destroying it waits (up
+// to 10 s) for the threads providers started through it.
 class Broker
 {
   public:
+    // Number of distinct CMPIBroker pointers the broker can hand out.
+    static constexpr std::size_t viewCount = 3;
+
     explicit Broker(Schema schema = selSchema());
     ~Broker();
     Broker(const Broker&) = delete;
     Broker& operator=(const Broker&) = delete;
 
     const CMPIBroker* cmpi() const;
+    // Distinct CMPIBroker pointers over this one broker (0 is cmpi()), as
+    // OpenPegasus gives each MI a broker object of its own. Throws
+    // std::out_of_range for an index of viewCount or more.
+    const CMPIBroker* cmpiView(std::size_t index) const;
     FaultPlan& faults();
     const Schema& schema() const;
 
     std::vector<TraceRecord> traces() const;
     void clearTraces();
     std::vector<LogRecord> logs() const;
-    std::vector<DeliveredIndication> indications() const;
-    void clearIndications();
+    // Receives, from now on, every indication delivered into @p nameSpace
+    // (compared ignoring case), like a subscriber's listener.
+    IndicationInbox listen(std::string nameSpace);
+    // Indications accepted by deliverIndication, and of those, how many no
+    // inbox was listening for.
+    std::size_t deliveredIndications() const;
+    std::size_t unheardIndications() const;
+
+    // Threads started through newThread that have not returned yet, and a
+    // bounded wait for them to end.
+    std::size_t runningThreads() const;
+    bool waitForThreads(std::chrono::milliseconds timeout);
 
     // Objects made by clone() (or prepareAttachThread) and not released.
     std::size_t outstandingClones() const;
@@ -81,6 +102,10 @@ class Broker
     CMPIObjectPath* makeObjectPath(const ObjectPath& path);
     CMPIInstance* makeInstance(const Instance& instance);
     CMPIArgs* makeArgs(const NamedValues& args = {});
+    // The filter of a subscription, as object managers hand it to
+    // activateFilter and its siblings.
+    CMPISelectExp* makeSelectExp(const std::string& query,
+                                 const std::string& language);
     // Copy out; throw std::invalid_argument for objects not made by a
     // broker (or with a NULL handle).
     static Instance toInstance(const CMPIInstance* instance);

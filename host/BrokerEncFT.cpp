@@ -59,6 +59,10 @@ const char* typeOf(const void* object)
     {
         return "CMPIArgs";
     }
+    if (ft == &selectExpFT)
+    {
+        return "CMPISelectExp";
+    }
     return nullptr;
 }
 

@@ -1,6 +1,8 @@
 // Operating-system services on POSIX threads. These calls carry no broker
 // handle, so none of them can be counted or made to fail per broker, except
-// newThread, which is counted through the broker of the calling request.
+// newThread, which is counted through the broker of the calling request or
+// attachment (or the only live broker). That broker also keeps track of the
+// thread until it returns, and waits for it before it goes away.
 #include "BrokerState.h"
 
 #include <cerrno>
@@ -20,10 +22,23 @@ static_assert(sizeof(CMPI_THREAD_KEY_TYPE) == sizeof(pthread_key_t));
 static_assert(sizeof(pthread_t) <= sizeof(CMPI_THREAD_TYPE));
 static_assert(sizeof(pthread_once_t) == sizeof(int));
 
-bool threadFaultPlanned()
+// What a started thread needs before it runs the provider's routine.
+struct ThreadStart
 {
-    BrokerState* b = BrokerState::forThisThread();
-    return b != nullptr && b->fault(BrokerCall::NewThread).has_value();
+    BrokerState* broker;
+    CMPI_THREAD_RETURN (*start)(void*);
+    void* parm;
+};
+
+void* runThread(void* raw)
+{
+    const std::unique_ptr<ThreadStart> thread(static_cast<ThreadStart*>(raw));
+    void* const result = thread->start(thread->parm);
+    if (thread->broker != nullptr)
+    {
+        thread->broker->threadEnded();
+    }
+    return result;
 }
 
 char* resolveFileName(const char* filename)
@@ -44,22 +59,34 @@ char* resolveFileName(const char* filename)
 CMPI_THREAD_TYPE newThread(CMPI_THREAD_RETURN (*start)(void*), void* parm,
                            int detached)
 {
-    if (start == nullptr || threadFaultPlanned())
+    BrokerState* b = BrokerState::forThisThread();
+    if (start == nullptr ||
+        (b != nullptr && b->fault(BrokerCall::NewThread).has_value()))
     {
         return nullptr;
     }
+    auto thread = std::make_unique<ThreadStart>(ThreadStart{b, start, parm});
     pthread_attr_t attr;
     pthread_attr_init(&attr);
     pthread_attr_setdetachstate(&attr, detached ? PTHREAD_CREATE_DETACHED
                                                 : PTHREAD_CREATE_JOINABLE);
-    pthread_t thread{};
-    const int rc = pthread_create(&thread, &attr, start, parm);
+    if (b != nullptr)
+    {
+        b->threadStarted();
+    }
+    pthread_t handle{};
+    const int rc = pthread_create(&handle, &attr, runThread, thread.get());
     pthread_attr_destroy(&attr);
     if (rc != 0)
     {
+        if (b != nullptr)
+        {
+            b->threadEnded();
+        }
         return nullptr;
     }
-    return reinterpret_cast<CMPI_THREAD_TYPE>(thread);
+    thread.release(); // runThread owns it now
+    return reinterpret_cast<CMPI_THREAD_TYPE>(handle);
 }
 
 int joinThread(CMPI_THREAD_TYPE thread, CMPI_THREAD_RETURN* retval)

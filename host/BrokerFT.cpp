@@ -1,5 +1,6 @@
 // Up-calls: thread attachment and indication delivery work; the operations
-// a provider could ask of the object manager are not offered.
+// a provider could ask of the object manager are not offered. Indications
+// go to the inboxes listening on their namespace (IndicationInbox).
 #include "BrokerState.h"
 #include "Objects.h"
 
@@ -44,7 +45,13 @@ CMPIStatus attachThread(const CMPIBroker* mb, const CMPIContext* ctx)
 CMPIStatus detachThread(const CMPIBroker* mb, const CMPIContext* ctx)
 {
     BrokerState* b = BrokerState::of(mb);
-    return b ? b->detach(ctx) : errorStatus(CMPI_RC_ERR_INVALID_HANDLE);
+    if (b == nullptr)
+    {
+        return errorStatus(CMPI_RC_ERR_INVALID_HANDLE);
+    }
+    const bool fails = b->fault(BrokerCall::DetachThread).has_value();
+    const CMPIStatus status = b->detach(ctx);
+    return fails ? errorStatus(CMPI_RC_ERR_FAILED) : status;
 }
 
 CMPIStatus deliverIndication(const CMPIBroker* mb, const CMPIContext* ctx,
@@ -67,14 +74,18 @@ CMPIStatus deliverIndication(const CMPIBroker* mb, const CMPIContext* ctx,
     {
         return errorStatus(CMPI_RC_ERR_INVALID_PARAMETER);
     }
+    // An object manager keeps track of a provider's objects per request or
+    // attached thread; delivering from anywhere else is not supported.
+    if (!b->inScopeOnThisThread())
+    {
+        return errorStatus(CMPI_RC_ERR_FAILED);
+    }
     const InstanceObject* i = InstanceObject::of(ind);
     if (i == nullptr)
     {
         return errorStatus(CMPI_RC_ERR_INVALID_HANDLE);
     }
-    DeliveredIndication delivered{ns, i->snapshot()};
-    const std::lock_guard lock(b->indicationMutex);
-    b->indications.push_back(std::move(delivered));
+    b->deliver(DeliveredIndication{ns, i->snapshot(), mb});
     return okStatus();
 }
 

@@ -1,6 +1,11 @@
 #include "BrokerState.h"
 
+#include "Names.h"
+
 #include <algorithm>
+#include <array>
+#include <iterator>
+#include <stdexcept>
 
 namespace host::detail
 {
@@ -14,8 +19,67 @@ struct Scope
     const CMPIContext* attached;
 };
 
-// Innermost last. A request or an attachment is open on one thread only.
-thread_local std::vector<Scope> scopes;
+// The requests and attachments open on one thread, innermost last. Of
+// fixed capacity and trivially destructible: a thread's first use of a
+// thread_local that needs a destructor registers it under the dynamic
+// loader's lock, and a provider's thread may get here while its library
+// is being unloaded under that very lock.
+class ScopeStack
+{
+  public:
+    static constexpr std::size_t capacity = 64;
+
+    Scope* begin()
+    {
+        return entries_.data();
+    }
+    Scope* end()
+    {
+        return entries_.data() + depth_;
+    }
+    std::reverse_iterator<Scope*> rbegin()
+    {
+        return std::reverse_iterator<Scope*>(end());
+    }
+    std::reverse_iterator<Scope*> rend()
+    {
+        return std::reverse_iterator<Scope*>(begin());
+    }
+    bool empty() const
+    {
+        return depth_ == 0;
+    }
+    const Scope& back() const
+    {
+        return entries_[depth_ - 1];
+    }
+    bool push(const Scope& scope)
+    {
+        if (depth_ == capacity)
+        {
+            return false;
+        }
+        entries_[depth_++] = scope;
+        return true;
+    }
+    void erase(Scope* at)
+    {
+        std::copy(at + 1, end(), at);
+        --depth_;
+    }
+    template <typename Predicate>
+    void eraseIf(Predicate predicate)
+    {
+        depth_ = static_cast<std::size_t>(
+            std::remove_if(begin(), end(), predicate) - begin());
+    }
+
+  private:
+    std::array<Scope, capacity> entries_;
+    std::size_t depth_;
+};
+
+thread_local ScopeStack scopes{};
 
 std::mutex liveMutex;
 std::vector<BrokerState*> liveBrokers;
@@ -62,6 +126,10 @@ ContextObject::~ContextObject()
     broker->unregisterContext(&cmpi);
 }
 
+// Longest a broker waits, when it is destroyed, for threads a provider
+// started through it and that still run.
+constexpr std::chrono::seconds threadDrainLimit{10};
+
 BrokerState::BrokerState(Schema s) : schema(std::move(s))
 {
     cmpi.hdl = this;
@@ -69,12 +137,18 @@ BrokerState::BrokerState(Schema s) : schema(std::move(s))
     cmpi.eft = &brokerEncFT;
     cmpi.xft = &brokerExtFT;
     cmpi.mft = nullptr;
+    for (CMPIBroker& view : otherViews)
+    {
+        view = cmpi;
+    }
     const std::lock_guard lock(liveMutex);
     liveBrokers.push_back(this);
 }
 
 BrokerState::~BrokerState()
 {
+    // A provider thread still running would use what is freed below.
+    waitForThreads(threadDrainLimit);
     {
         const std::lock_guard lock(liveMutex);
         std::erase(liveBrokers, this);
@@ -91,7 +165,7 @@ BrokerState::~BrokerState()
     }
     doomed.clear();
     // Drop any scope this thread still has for this broker.
-    std::erase_if(scopes, [this](const Scope& s) { return s.broker == this; });
+    scopes.eraseIf([this](const Scope& s) { return s.broker == this; });
 }
 
 BrokerState* BrokerState::of(const CMPIBroker* mb)
@@ -147,7 +221,10 @@ Arena& BrokerState::currentArena()
 
 void BrokerState::pushScope(Arena* arena, const CMPIContext* attached)
 {
-    scopes.push_back({this, arena, attached});
+    if (!scopes.push({this, arena, attached}))
+    {
+        throw std::length_error("too many nested requests on one thread");
+    }
 }
 
 void BrokerState::popScope(Arena* arena)
@@ -173,7 +250,12 @@ CMPIStatus BrokerState::attach(const CMPIContext* ctx)
         const std::lock_guard lock(attachMutex);
         arena = &attachArenas.emplace_back();
     }
-    pushScope(arena, ctx);
+    if (!scopes.push({this, arena, ctx}))
+    {
+        const std::lock_guard lock(attachMutex);
+        attachArenas.remove_if([arena](const Arena& a) { return &a == arena; });
+        return errorStatus(CMPI_RC_ERR_FAILED);
+    }
     return okStatus();
 }
 
@@ -200,10 +282,78 @@ CMPIStatus BrokerState::detach(const CMPIContext* ctx)
                     doomed.splice(doomed.begin(), attachArenas, found);
                 }
             }
+            ContextObject* context = ContextObject::of(ctx);
+            if (context != nullptr && context->ownership == Ownership::Prepared)
+            {
+                release(context);
+            }
             break;
         }
     }
     return okStatus();
+}
+
+bool BrokerState::inScopeOnThisThread() const
+{
+    return std::any_of(scopes.begin(), scopes.end(),
+                       [this](const Scope& s) { return s.broker == this; });
+}
+
+void BrokerState::deliver(DeliveredIndication indication)
+{
+    const std::lock_guard lock(indicationMutex);
+    ++deliveredCount;
+    std::vector<std::shared_ptr<InboxState>> listeners;
+    std::erase_if(inboxes,
+                  [&](const std::weak_ptr<InboxState>& weak)
+                  {
+                      auto inbox = weak.lock();
+                      if (!inbox)
+                      {
+                          return true;
+                      }
+                      if (sameName(inbox->nameSpace, indication.nameSpace))
+                      {
+                          listeners.push_back(std::move(inbox));
+                      }
+                      return false;
+                  });
+    if (listeners.empty())
+    {
+        ++unheardCount;
+        return;
+    }
+    for (const auto& inbox : listeners)
+    {
+        {
+            const std::lock_guard inboxLock(inbox->mutex);
+            inbox->queue.push_back(indication);
+            ++inbox->received;
+        }
+        inbox->arrived.notify_all();
+    }
+}
+
+void BrokerState::threadStarted()
+{
+    const std::lock_guard lock(threadMutex);
+    ++liveThreads;
+}
+
+void BrokerState::threadEnded()
+{
+    // Notified under the lock: the broker may be destroyed as soon as the
+    // waiter sees the count reach 0.
+    const std::lock_guard lock(threadMutex);
+    --liveThreads;
+    threadsDone.notify_all();
+}
+
+bool BrokerState::waitForThreads(std::chrono::milliseconds timeout)
+{
+    std::unique_lock lock(threadMutex);
+    return threadsDone.wait_for(lock, timeout,
+                                [this] { return liveThreads == 0; });
 }
 
 void BrokerState::registerContext(const CMPIContext* ctx)

@@ -9,6 +9,10 @@
 
 #include <cmpift.h>
 
+#include <array>
+#include <chrono>
+#include <condition_variable>
+#include <deque>
 #include <list>
 #include <map>
 #include <memory>
@@ -23,6 +27,17 @@ namespace host::detail
 extern CMPIBrokerFT brokerFT;
 extern CMPIBrokerEncFT brokerEncFT;
 extern CMPIBrokerExtFT brokerExtFT;
+
+// The queue behind one IndicationInbox.
+struct InboxState
+{
+    explicit InboxState(std::string ns) : nameSpace(std::move(ns)) {}
+    const std::string nameSpace;
+    std::mutex mutex;
+    std::condition_variable arrived;
+    std::deque<DeliveredIndication> queue;
+    std::size_t received = 0;
+};
 
 struct BrokerState
 {
@@ -65,7 +80,21 @@ struct BrokerState
     void pushScope(Arena* arena, const CMPIContext* attached);
     void popScope(Arena* arena);
     CMPIStatus attach(const CMPIContext* ctx);
+    // Ends the attachment of this thread to @p ctx: frees what the thread
+    // made meanwhile and, as SFCB does, the context itself when it came
+    // from prepareAttachThread.
     CMPIStatus detach(const CMPIContext* ctx);
+    // Whether this thread has a request open on this broker, or is
+    // attached to one of its contexts.
+    bool inScopeOnThisThread() const;
+
+    // Hands a delivered indication to every inbox of its namespace.
+    void deliver(DeliveredIndication indication);
+
+    // Threads started through newThread that have not returned yet.
+    void threadStarted();
+    void threadEnded();
+    bool waitForThreads(std::chrono::milliseconds timeout);
 
     void registerContext(const CMPIContext* ctx);
     void unregisterContext(const CMPIContext* ctx);
@@ -81,6 +110,9 @@ struct BrokerState
     std::unordered_set<const CMPIContext*> contexts;
 
     CMPIBroker cmpi{};
+    // Further CMPIBroker structs over this same state, for hosts that give
+    // each MI factory a broker pointer of its own (as OpenPegasus does).
+    std::array<CMPIBroker, 2> otherViews{};
     Schema schema;
     FaultPlan faults;
 
@@ -89,7 +121,13 @@ struct BrokerState
     std::vector<LogRecord> logs;
 
     mutable std::mutex indicationMutex;
-    std::vector<DeliveredIndication> indications;
+    std::vector<std::weak_ptr<InboxState>> inboxes;
+    std::size_t deliveredCount = 0;
+    std::size_t unheardCount = 0; // delivered with no inbox listening
+
+    mutable std::mutex threadMutex;
+    std::condition_variable threadsDone;
+    std::size_t liveThreads = 0;
 
     mutable std::mutex ownedMutex;
     std::map<Object*, std::unique_ptr<Object>> owned;

@@ -26,8 +26,9 @@ enum class BrokerCall
     AttachThread,
     NewThread,
     DeliverIndication,
+    DetachThread, // a failure still detaches, but reports CMPI_RC_ERR_FAILED
 };
-inline constexpr std::size_t brokerCallCount = 15;
+inline constexpr std::size_t brokerCallCount = 16;
 
 enum class FaultMode
 {

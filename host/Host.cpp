@@ -40,11 +40,12 @@ Outcome missingSlot(const char* slot)
 }
 
 template <typename MI, typename Factory>
-MI* createMI(Broker& broker, const char* type, Factory&& factory)
+MI* createMI(Broker& broker, const CMPIBroker* given, const char* type,
+             Factory&& factory)
 {
     Broker::Request request(broker);
     CMPIStatus status{CMPI_RC_OK, nullptr};
-    MI* mi = factory(broker.cmpi(), request.context(), &status);
+    MI* mi = factory(given, request.context(), &status);
     if (mi == nullptr || status.rc != CMPI_RC_OK)
     {
         const Outcome out = request.finish(status);
@@ -54,7 +55,39 @@ MI* createMI(Broker& broker, const char* type, Factory&& factory)
     return mi;
 }
 
+// Indexes of the broker pointers handed to the three factories when each
+// gets its own.
+constexpr std::size_t instanceView = 0;
+constexpr std::size_t methodView = 1;
+constexpr std::size_t indicationView = 2;
+
 } // namespace
+
+ObjectPath IndicationFilter::classPath() const
+{
+    ObjectPath path;
+    path.nameSpace = sourceNamespace;
+    path.className = className;
+    return path;
+}
+
+IndicationFilter IndicationFilter::forClass(std::string className,
+                                            std::string sourceNamespace)
+{
+    IndicationFilter filter;
+    filter.query = "SELECT * FROM " + className;
+    filter.className = std::move(className);
+    filter.sourceNamespace = std::move(sourceNamespace);
+    return filter;
+}
+
+Host::Host(const std::string& libraryPath, HostOptions options) :
+    broker_(std::move(options.schema)), brokerPerMI_(options.brokerPerMI),
+    library_(std::make_unique<ProviderLibrary>(libraryPath,
+                                               std::move(options.providerName)))
+{
+    createMIs(nullptr);
+}
 
 Host::Host(const std::string& libraryPath, std::string providerName,
            Schema schema) :
@@ -97,21 +130,21 @@ void Host::createEachMI(const ProviderFactories* factories)
         return factory;
     };
     instanceMI_ = createMI<CMPIInstanceMI>(
-        broker_, "instance",
+        broker_, instanceBroker(), "instance",
         [&](const CMPIBroker* b, const CMPIContext* c, CMPIStatus* s)
         {
             return factories ? need(factories->instance, "instance")(b, c, s)
                              : lib->createInstanceMI(b, c, s);
         });
     methodMI_ = createMI<CMPIMethodMI>(
-        broker_, "method",
+        broker_, methodBroker(), "method",
         [&](const CMPIBroker* b, const CMPIContext* c, CMPIStatus* s)
         {
             return factories ? need(factories->method, "method")(b, c, s)
                              : lib->createMethodMI(b, c, s);
         });
     indicationMI_ = createMI<CMPIIndicationMI>(
-        broker_, "indication",
+        broker_, indicationBroker(), "indication",
         [&](const CMPIBroker* b, const CMPIContext* c, CMPIStatus* s)
         {
             return factories
@@ -135,6 +168,26 @@ Host::~Host()
 Broker& Host::broker()
 {
     return broker_;
+}
+
+const CMPIBroker* Host::instanceBroker() const
+{
+    return broker_.cmpiView(brokerPerMI_ ? instanceView : 0);
+}
+
+const CMPIBroker* Host::methodBroker() const
+{
+    return broker_.cmpiView(brokerPerMI_ ? methodView : 0);
+}
+
+const CMPIBroker* Host::indicationBroker() const
+{
+    return broker_.cmpiView(brokerPerMI_ ? indicationView : 0);
+}
+
+IndicationInbox Host::listen(std::string nameSpace)
+{
+    return broker_.listen(std::move(nameSpace));
 }
 
 CMPIInstanceMI* Host::instanceMI()
@@ -269,6 +322,70 @@ Outcome Host::invokeMethod(const ObjectPath& path, const std::string& method,
     return outcome;
 }
 
+Outcome Host::authorizeFilter(const IndicationFilter& filter,
+                              const std::string& owner)
+{
+    if (indicationMI_->ft->authorizeFilter == nullptr)
+    {
+        return missingSlot("authorizeFilter");
+    }
+    Broker::Request request(broker_);
+    const CMPIStatus status = indicationMI_->ft->authorizeFilter(
+        indicationMI_, request.context(),
+        broker_.makeSelectExp(filter.query, filter.language),
+        filter.className.c_str(), broker_.makeObjectPath(filter.classPath()),
+        owner.c_str());
+    return request.finish(status);
+}
+
+Outcome Host::mustPoll(const IndicationFilter& filter)
+{
+    if (indicationMI_->ft->mustPoll == nullptr)
+    {
+        return missingSlot("mustPoll");
+    }
+    Broker::Request request(broker_);
+    const CMPIStatus status = indicationMI_->ft->mustPoll(
+        indicationMI_, request.context(),
+        broker_.makeSelectExp(filter.query, filter.language),
+        filter.className.c_str(), broker_.makeObjectPath(filter.classPath()));
+    return request.finish(status);
+}
+
+Outcome Host::activateFilter(const IndicationFilter& filter,
+                             bool firstActivation, const ObjectPath* classPath)
+{
+    if (indicationMI_->ft->activateFilter == nullptr)
+    {
+        return missingSlot("activateFilter");
+    }
+    Broker::Request request(broker_);
+    const CMPIStatus status = indicationMI_->ft->activateFilter(
+        indicationMI_, request.context(),
+        broker_.makeSelectExp(filter.query, filter.language),
+        filter.className.c_str(),
+        broker_.makeObjectPath(classPath ? *classPath : filter.classPath()),
+        firstActivation ? 1 : 0);
+    return request.finish(status);
+}
+
+Outcome Host::deActivateFilter(const IndicationFilter& filter,
+                               bool lastActivation, const ObjectPath* classPath)
+{
+    if (indicationMI_->ft->deActivateFilter == nullptr)
+    {
+        return missingSlot("deActivateFilter");
+    }
+    Broker::Request request(broker_);
+    const CMPIStatus status = indicationMI_->ft->deActivateFilter(
+        indicationMI_, request.context(),
+        broker_.makeSelectExp(filter.query, filter.language),
+        filter.className.c_str(),
+        broker_.makeObjectPath(classPath ? *classPath : filter.classPath()),
+        lastActivation ? 1 : 0);
+    return request.finish(status);
+}
+
 Outcome Host::enableIndications()
 {
     if (indicationMI_->ft->enableIndications == nullptr)
@@ -278,7 +395,10 @@ Outcome Host::enableIndications()
     Broker::Request request(broker_);
     Outcome out = request.finish(
         indicationMI_->ft->enableIndications(indicationMI_, request.context()));
-    indicationsEnabled_ = indicationsEnabled_ || out.rc == CMPI_RC_OK;
+    if (out.rc == CMPI_RC_OK)
+    {
+        indicationsEnabled_ = true;
+    }
     return out;
 }
 

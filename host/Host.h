@@ -8,6 +8,7 @@
 
 #include <cmpift.h>
 
+#include <atomic>
 #include <memory>
 #include <string>
 #include <vector>
@@ -26,6 +27,30 @@ struct ProviderFactories
                                     CMPIStatus*) = nullptr;
 };
 
+// A subscription's filter as an object manager holds it.
+struct IndicationFilter
+{
+    std::string query; // e.g. SELECT * FROM ZAN_MgmtHwLogClearEvent
+    std::string language = "WQL";
+    std::string className; // the indication class the query selects
+    std::string sourceNamespace = "root/zanqx";
+
+    // sourceNamespace:className, the class path passed with the filter.
+    ObjectPath classPath() const;
+    // A filter for every indication of @p className.
+    static IndicationFilter
+    forClass(std::string className, std::string sourceNamespace = "root/zanqx");
+};
+
+struct HostOptions
+{
+    std::string providerName = "SELProvider";
+    Schema schema = selSchema();
+    // Hand each MI factory a broker pointer of its own (over one broker), as
+    // OpenPegasus does, instead of the same one for all, as SFCB does.
+    bool brokerPerMI = false;
+};
+
 // A broker with a provider loaded into it, and the operations a CIMOM
 // performs on the provider's behalf. Loading creates the instance, method
 // and indication MIs; destroying disables indications if they are enabled
@@ -39,6 +64,7 @@ class Host
     explicit Host(const std::string& libraryPath,
                   std::string providerName = "SELProvider",
                   Schema schema = selSchema());
+    Host(const std::string& libraryPath, HostOptions options);
     explicit Host(const ProviderFactories& factories,
                   Schema schema = selSchema());
     ~Host();
@@ -65,8 +91,26 @@ class Host
                       const std::string& language);
     Outcome invokeMethod(const ObjectPath& path, const std::string& method,
                          const NamedValues& in = {});
+    // The indication MI's filter operations. Each passes a select
+    // expression carrying the filter's query and language, the filter's
+    // class name and a class path: the filter's own unless @p classPath is
+    // given (SFCB deactivates with a path whose class name is empty).
+    Outcome authorizeFilter(const IndicationFilter& filter,
+                            const std::string& owner);
+    Outcome mustPoll(const IndicationFilter& filter);
+    Outcome activateFilter(const IndicationFilter& filter, bool firstActivation,
+                           const ObjectPath* classPath = nullptr);
+    Outcome deActivateFilter(const IndicationFilter& filter,
+                             bool lastActivation,
+                             const ObjectPath* classPath = nullptr);
     Outcome enableIndications();
     Outcome disableIndications();
+    // Indications delivered into @p nameSpace from now on.
+    IndicationInbox listen(std::string nameSpace);
+    // The broker pointer each MI factory was given.
+    const CMPIBroker* instanceBroker() const;
+    const CMPIBroker* methodBroker() const;
+    const CMPIBroker* indicationBroker() const;
     // Calls the three cleanup slots; the first failure's code is returned
     // (its message belonged to the request and is not kept).
     CMPIStatus cleanupAll(bool terminating);
@@ -76,12 +120,14 @@ class Host
     void createEachMI(const ProviderFactories* factories);
 
     Broker broker_;
+    bool brokerPerMI_ = false;
     std::unique_ptr<ProviderLibrary> library_;
     CMPIInstanceMI* instanceMI_ = nullptr;
     CMPIMethodMI* methodMI_ = nullptr;
     CMPIIndicationMI* indicationMI_ = nullptr;
     bool terminated_ = false;
-    bool indicationsEnabled_ = false;
+    // Enable and disable may come from different threads.
+    std::atomic<bool> indicationsEnabled_{false};
 };
 
 } // namespace host

@@ -26,6 +26,7 @@ extern CMPIInstanceFT instanceFT;
 extern CMPIResultFT resultFT;
 extern CMPIContextFT contextFT;
 extern CMPIArgsFT argsFT;
+extern CMPISelectExpFT selectExpFT;
 
 enum class Ownership
 {
@@ -160,6 +161,20 @@ struct ArgsObject : Encapsulated<CMPIArgs, CMPIArgsFT, &argsFT>
         return from<ArgsObject>(a);
     }
     NamedValues args;
+};
+
+// The filter an object manager hands to an indication MI: the query and
+// its language, as a subscription's filter instance holds them.
+struct SelectExpObject :
+    Encapsulated<CMPISelectExp, CMPISelectExpFT, &selectExpFT>
+{
+    using Encapsulated::Encapsulated;
+    static SelectExpObject* of(const CMPISelectExp* e)
+    {
+        return from<SelectExpObject>(e);
+    }
+    std::string query;
+    std::string language;
 };
 
 // Owns broker objects until it is destroyed. Thread-safe.

@@ -101,6 +101,8 @@ struct DeliveredIndication
 {
     std::string nameSpace;
     Instance instance;
+    // The broker pointer the provider delivered through.
+    const void* broker = nullptr;
 };
 
 // The name of a CMPI type code, e.g. "CMPI_uint16A"; "unknown" otherwise.

@@ -10,6 +10,7 @@
  *   log.level      = N              (N >= 0; 0 disables the log channel)
  *   trace.level    = N              (N >= 0; 0 disables the trace channel)
  *   log.components = * | name[,name...]
+ *   locale         = en | de         (empty: the process environment)
  */
 #include "Platform.h"
 
@@ -167,6 +168,16 @@ Configuration parseConfiguration(const std::string& text,
                 at.fail("log.components must list components or be *");
             }
             configuration.logComponents = value;
+        }
+        else if (key == "locale")
+        {
+            if (!value.empty() && value != "en" && value != "de")
+            {
+                at.fail("locale must be en or de (or empty for the "
+                        "environment), not \"" +
+                        value + "\"");
+            }
+            configuration.locale = value;
         }
         else
         {

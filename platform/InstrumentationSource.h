@@ -3,8 +3,10 @@
 #include "DateTime.h"
 #include "NodeLexicon.h"
 #include "NodeTree.h"
+#include "SimulatedAlert.h"
 
 #include <memory>
+#include <stdexcept>
 #include <string>
 
 namespace QX
@@ -61,14 +63,37 @@ class InstrumentationSource
     /** Printable form of a path of this source. */
     virtual std::string printablePath(const std::string& path) const = 0;
 
-    /** Registers @p callback for alerts of nodes of @p kind. */
+    /**
+     * Registers @p callback for alerts of nodes of @p kind. Callbacks are
+     * called on a thread of the source, never on the thread that caused the
+     * alert, with the alert code of the node's kind (NodeLexicon), the time
+     * of the event and the node's path.
+     */
     virtual void startMonitoring(NodeLexicon::NodeType kind,
                                  MonitorCallback callback,
                                  const void* context) = 0;
-    /** Removes a registration made with the same three arguments. */
+    /**
+     * Removes one registration made with the same three arguments. Once this
+     * returns, that registration's callback is not running and is not called
+     * again (a library that registered callbacks relies on this before it is
+     * unloaded). Called from within a callback, it only prevents later calls.
+     */
     virtual void stopMonitoring(NodeLexicon::NodeType kind,
                                 MonitorCallback callback,
                                 const void* context) = 0;
+
+    /**
+     * Makes the hardware behind the source raise @p alert, as it would by
+     * itself (see SimulatedAlert). Sources that cannot simulate throw
+     * std::runtime_error saying so; only the in-memory source can.
+     */
+    virtual void raiseSimulatedAlert(SimulatedAlert alert)
+    {
+        throw std::runtime_error(
+            std::string("this instrumentation source cannot simulate "
+                        "alerts (asked for \"") +
+            simulatedAlertName(alert) + "\"); only source = memory can");
+    }
 
     /**
      * Called by a cursor before each of its operations. A source throws a

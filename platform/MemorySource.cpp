@@ -2,7 +2,9 @@
 
 #include <algorithm>
 #include <cstdio>
+#include <ctime>
 #include <iterator>
+#include <set>
 #include <stdexcept>
 
 namespace QX
@@ -62,21 +64,33 @@ bool MemorySource::writeProperty(const std::string& path,
         {
             return false;
         }
-        NodeTreeBuilder builder(*tree_);
-        for (const NodeTree::NodeId log :
-             tree_->nodesOfKind(NodeLexicon::EventLog, *controller))
+        for (std::string& logPath : clearLogsLocked(*controller))
         {
-            const std::string& logPath = tree_->node(log).path;
-            builder.removeNodes(NodeLexicon::EventLogEntry, logPath)
-                .setProperty(logPath, NodeLexicon::IsEmpty, true)
-                .setStatus(logPath, NodeLexicon::EventLogStatusCleared);
-            alerts.emplace_back(logPath, NodeLexicon::AlertOnEventLog);
+            alerts.emplace_back(std::move(logPath),
+                                NodeLexicon::AlertOnEventLog);
         }
-        tree_ = builder.build();
         ++acceptedWrites_;
     }
     deliver(alerts, NodeLexicon::EventLog, DateTime::now());
     return true;
+}
+
+std::vector<std::string>
+MemorySource::clearLogsLocked(NodeTree::NodeId controller)
+{
+    std::vector<std::string> cleared;
+    NodeTreeBuilder builder(*tree_);
+    for (const NodeTree::NodeId log :
+         tree_->nodesOfKind(NodeLexicon::EventLog, controller))
+    {
+        const std::string& logPath = tree_->node(log).path;
+        builder.removeNodes(NodeLexicon::EventLogEntry, logPath)
+            .setProperty(logPath, NodeLexicon::IsEmpty, true)
+            .setStatus(logPath, NodeLexicon::EventLogStatusCleared);
+        cleared.push_back(logPath);
+    }
+    tree_ = builder.build();
+    return cleared;
 }
 
 std::string MemorySource::printablePath(const std::string& path) const
@@ -88,25 +102,13 @@ void MemorySource::startMonitoring(NodeLexicon::NodeType kind,
                                    MonitorCallback callback,
                                    const void* context)
 {
-    const std::lock_guard lock(mutex_);
-    monitors_.push_back(Monitor{kind, callback, context});
+    dispatcher_.add(kind, callback, context);
 }
 
 void MemorySource::stopMonitoring(NodeLexicon::NodeType kind,
                                   MonitorCallback callback, const void* context)
 {
-    const std::lock_guard lock(mutex_);
-    const auto found = std::find_if(monitors_.begin(), monitors_.end(),
-                                    [&](const Monitor& monitor)
-                                    {
-                                        return monitor.kind == kind &&
-                                               monitor.callback == callback &&
-                                               monitor.context == context;
-                                    });
-    if (found != monitors_.end())
-    {
-        monitors_.erase(found);
-    }
+    dispatcher_.remove(kind, callback, context);
 }
 
 void MemorySource::beforeOperation(CursorOperation operation)
@@ -222,10 +224,12 @@ void MemorySource::refuseWrites(bool refuse)
 
 std::size_t MemorySource::monitorCount(NodeLexicon::NodeType kind) const
 {
-    const std::lock_guard lock(mutex_);
-    return static_cast<std::size_t>(std::count_if(
-        monitors_.begin(), monitors_.end(),
-        [kind](const Monitor& monitor) { return monitor.kind == kind; }));
+    return dispatcher_.count(kind);
+}
+
+bool MemorySource::waitForAlerts(std::chrono::milliseconds timeout) const
+{
+    return dispatcher_.waitIdle(timeout);
 }
 
 unsigned MemorySource::acceptedWrites() const
@@ -246,25 +250,197 @@ void MemorySource::deliver(
     const std::vector<std::pair<std::string, unsigned>>& alerts,
     NodeLexicon::NodeType kind, const DateTime& when)
 {
-    // Callbacks run without the lock: they may well call back into this
-    // source (take a snapshot, start or stop monitoring).
-    std::vector<Monitor> targets;
-    {
-        const std::lock_guard lock(mutex_);
-        std::copy_if(
-            monitors_.begin(), monitors_.end(), std::back_inserter(targets),
-            [kind](const Monitor& monitor) { return monitor.kind == kind; });
-    }
+    std::vector<PendingAlert> pending;
+    pending.reserve(alerts.size());
     for (const auto& [path, code] : alerts)
     {
-        for (const Monitor& monitor : targets)
+        pending.push_back(PendingAlert{kind, code, when, path});
+    }
+    dispatcher_.post(std::move(pending));
+}
+
+void MemorySource::raiseSimulatedAlert(SimulatedAlert alert)
+{
+    switch (alert)
+    {
+        case SimulatedAlert::RecordAdded:
+            simulateRecord();
+            return;
+        case SimulatedAlert::LogCleared:
         {
-            if (monitor.callback != nullptr)
+            std::vector<std::pair<std::string, unsigned>> alerts;
             {
-                monitor.callback(code, when, path, monitor.context);
+                const std::lock_guard lock(mutex_);
+                for (std::string& logPath :
+                     clearLogsLocked(firstControllerLocked()))
+                {
+                    alerts.emplace_back(std::move(logPath),
+                                        NodeLexicon::AlertOnEventLog);
+                }
+            }
+            deliver(alerts, NodeLexicon::EventLog, DateTime::now());
+            return;
+        }
+        case SimulatedAlert::LogAlmostFull:
+            simulateLogStatus(NodeLexicon::EventLogStatusAlmostFull);
+            return;
+        case SimulatedAlert::LogFull:
+            simulateLogStatus(NodeLexicon::EventLogStatusFull);
+            return;
+        case SimulatedAlert::WatchdogRestart:
+            simulateRestart();
+            return;
+    }
+    InstrumentationSource::raiseSimulatedAlert(alert);
+}
+
+NodeTree::NodeId MemorySource::firstControllerLocked() const
+{
+    const auto& controllers =
+        tree_->nodesOfKind(NodeLexicon::ManagementController);
+    if (controllers.empty())
+    {
+        throw std::runtime_error(
+            "the simulated BMC has no management controller");
+    }
+    return controllers.front();
+}
+
+NodeTree::NodeId MemorySource::firstLogLocked() const
+{
+    const auto& logs =
+        tree_->nodesOfKind(NodeLexicon::EventLog, firstControllerLocked());
+    if (logs.empty())
+    {
+        throw std::runtime_error("the simulated BMC has no event log");
+    }
+    return logs.front();
+}
+
+namespace
+{
+
+/** The 16 bytes of an IPMI SEL record: a system boot event logged by the
+ *  BMC at @p when. */
+std::string bootRecordData(unsigned recordId, std::time_t when)
+{
+    const auto seconds = static_cast<std::uint32_t>(when);
+    const unsigned bytes[16] = {recordId & 0xffu,
+                                (recordId >> 8) & 0xffu,
+                                0x02,
+                                seconds & 0xffu,
+                                (seconds >> 8) & 0xffu,
+                                (seconds >> 16) & 0xffu,
+                                seconds >> 24,
+                                0x20,
+                                0x00,
+                                0x04,
+                                0x12,
+                                0x83,
+                                0x6f,
+                                0x01,
+                                0xff,
+                                0xff};
+    std::string text;
+    for (const unsigned byte : bytes)
+    {
+        char hex[4];
+        std::snprintf(hex, sizeof hex, "%02x", byte);
+        text += text.empty() ? "" : " ";
+        text += hex;
+    }
+    return text;
+}
+
+std::string utcTimestamp(std::time_t when)
+{
+    std::tm fields{};
+    gmtime_r(&when, &fields);
+    char text[32];
+    std::strftime(text, sizeof text, "%Y-%m-%d %H:%M:%S", &fields);
+    return text;
+}
+
+} // namespace
+
+void MemorySource::simulateRecord()
+{
+    std::string logPath;
+    unsigned recordId = 1;
+    {
+        const std::lock_guard lock(mutex_);
+        const NodeTree::NodeId log = firstLogLocked();
+        logPath = tree_->node(log).path;
+        // IPMI record ids are 16 bits, 0 and 0xffff reserved: take the one
+        // after the highest, or the lowest free one once that runs out.
+        std::set<unsigned> used;
+        for (const NodeTree::NodeId entry :
+             tree_->nodesOfKind(NodeLexicon::EventLogEntry, log))
+        {
+            const PropertyValue* id =
+                tree_->node(entry).find(NodeLexicon::RecordId);
+            if (id != nullptr && std::holds_alternative<unsigned>(*id))
+            {
+                used.insert(std::get<unsigned>(*id));
+            }
+        }
+        recordId = used.empty() ? 1 : *used.rbegin() + 1;
+        if (recordId > 0xfffe)
+        {
+            recordId = 1;
+            while (used.count(recordId) != 0 ||
+                   tree_->find(entryPath(logPath, recordId)))
+            {
+                ++recordId;
             }
         }
     }
+    const std::time_t now = std::time(nullptr);
+    appendEntry(logPath, recordId, utcTimestamp(now),
+                bootRecordData(recordId, now),
+                "System Event: OEM System boot event");
+}
+
+void MemorySource::simulateLogStatus(unsigned status)
+{
+    std::string logPath;
+    {
+        const std::lock_guard lock(mutex_);
+        logPath = tree_->node(firstLogLocked()).path;
+        NodeTreeBuilder builder(*tree_);
+        builder.setStatus(logPath, status);
+        tree_ = builder.build();
+    }
+    deliver({{logPath, NodeLexicon::AlertOnEventLog}}, NodeLexicon::EventLog,
+            DateTime::now());
+}
+
+void MemorySource::simulateRestart()
+{
+    std::string watchdogPath;
+    {
+        const std::lock_guard lock(mutex_);
+        const NodeTree::NodeId controller = firstControllerLocked();
+        const auto& watchdogs =
+            tree_->nodesOfKind(NodeLexicon::Watchdog, controller);
+        if (watchdogs.empty())
+        {
+            const std::string& controllerPath = tree_->node(controller).path;
+            watchdogPath = controllerPath + "/wdt";
+            NodeTreeBuilder builder(*tree_);
+            builder
+                .addNode(NodeLexicon::Watchdog, watchdogPath, controllerPath,
+                         "Watchdog", 1)
+                .setProperty(watchdogPath, NodeLexicon::RestartCause, 4u);
+            tree_ = builder.build();
+        }
+        else
+        {
+            watchdogPath = tree_->node(watchdogs.front()).path;
+        }
+    }
+    deliver({{watchdogPath, NodeLexicon::AlertOnWatchdog}},
+            NodeLexicon::Watchdog, DateTime::now());
 }
 
 } // namespace QX

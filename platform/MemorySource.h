@@ -1,8 +1,10 @@
 #pragma once
 
+#include "AlertDispatcher.h"
 #include "InstrumentationSource.h"
 
 #include <atomic>
+#include <chrono>
 #include <mutex>
 #include <optional>
 #include <string>
@@ -29,9 +31,10 @@ struct CursorFault
  * fixture file, see Fixture.h). Writing ClearEventLogCommand to the Command
  * property of a ManagementController empties every EventLog under it, sets
  * their IsEmpty to true and their status to EventLogStatusCleared, and
- * raises an AlertOnEventLog alert for each. Appending an entry raises
- * AlertOnEventLogEntry. Alerts are delivered synchronously on the calling
- * thread to the callbacks registered for the alerting node's kind.
+ * raises an AlertOnEventLog alert for each, as a BMC does when its log is
+ * cleared. Appending an entry raises AlertOnEventLogEntry. Alerts reach the
+ * callbacks registered for the alerting node's kind on the source's own
+ * dispatcher thread (see AlertDispatcher), in the order they were raised.
  *
  * Thread-safe: every member may be called from any thread.
  */
@@ -50,6 +53,18 @@ class MemorySource : public InstrumentationSource
     void stopMonitoring(NodeLexicon::NodeType kind, MonitorCallback callback,
                         const void* context) override;
     void beforeOperation(CursorOperation operation) override;
+    /**
+     * Changes the simulated BMC as its hardware would and raises the alert
+     * that goes with it, on the first controller's first log (or watchdog):
+     * RecordAdded appends a record with the next record id, the current
+     * time and a system boot event; LogCleared clears the controller's logs
+     * as the clear command does; LogAlmostFull and LogFull set the log's
+     * status to EventLogStatusAlmostFull or EventLogStatusFull;
+     * WatchdogRestart raises AlertOnWatchdog on the watchdog, adding one
+     * (RestartCause 4, a watchdog expiry) when the controller has none.
+     * Throws std::runtime_error when the tree has no controller or log.
+     */
+    void raiseSimulatedAlert(SimulatedAlert alert) override;
 
     /** Replaces the whole tree. */
     void replaceTree(std::shared_ptr<const NodeTree> tree);
@@ -76,6 +91,9 @@ class MemorySource : public InstrumentationSource
 
     /** Number of registered monitor callbacks for @p kind. */
     std::size_t monitorCount(NodeLexicon::NodeType kind) const;
+    /** Waits until every alert raised so far has been handed to its
+     *  callbacks and they returned; false when @p timeout ran out first. */
+    bool waitForAlerts(std::chrono::milliseconds timeout) const;
     /** How many writes the source has accepted so far. */
     unsigned acceptedWrites() const;
 
@@ -85,12 +103,6 @@ class MemorySource : public InstrumentationSource
     static std::string entryPath(const std::string& logPath, unsigned recordId);
 
   private:
-    struct Monitor
-    {
-        NodeLexicon::NodeType kind;
-        MonitorCallback callback;
-        const void* context;
-    };
     struct ArmedFault
     {
         CursorFault fault;
@@ -99,15 +111,27 @@ class MemorySource : public InstrumentationSource
 
     void deliver(const std::vector<std::pair<std::string, unsigned>>& alerts,
                  NodeLexicon::NodeType kind, const DateTime& when);
+    /** Clears the logs under @p controller in a copy of the tree; the
+     *  paths of the cleared logs. Call with the lock held. */
+    std::vector<std::string> clearLogsLocked(NodeTree::NodeId controller);
+    NodeTree::NodeId firstControllerLocked() const;
+    NodeTree::NodeId firstLogLocked() const;
+    /** Appends a simulated system boot record to the first log. */
+    void simulateRecord();
+    /** Sets the first log's status and raises AlertOnEventLog for it. */
+    void simulateLogStatus(unsigned status);
+    void simulateRestart();
 
     mutable std::mutex mutex_;
     std::shared_ptr<const NodeTree> tree_;
-    std::vector<Monitor> monitors_;
     std::vector<ArmedFault> faults_;
     // Lets cursor operations skip the lock while no fault is armed.
     std::atomic<bool> faultsArmed_{false};
     bool refuseWrites_ = false;
     unsigned acceptedWrites_ = 0;
+    // Last: destroyed (its thread joined) while the rest still exists, as
+    // callbacks may call back into the source.
+    AlertDispatcher dispatcher_;
 };
 
 } // namespace QX

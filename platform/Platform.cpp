@@ -3,6 +3,7 @@
 #include "CVLogger.h"
 #include "Fixture.h"
 #include "MemorySource.h"
+#include "Resources.h"
 #include "ipmi/IpmiSourceFactory.h"
 
 #include <iostream>
@@ -95,6 +96,7 @@ std::shared_ptr<InstrumentationSource> currentSource()
     {
         const Configuration configuration = loadConfiguration();
         configureLogger(configuration);
+        Locale::configureLanguage(configuration.locale);
         activeSource = makeSource(configuration);
     }
     catch (const std::exception& error)

@@ -33,6 +33,9 @@ struct Configuration
     int traceLevel = 0;
     /** Components written, comma separated; "*" for all. */
     std::string logComponents = "*";
+    /** Language of the message resources: "en", "de", or empty for the
+     *  process environment (LC_ALL, LC_MESSAGES, LANG). */
+    std::string locale;
 };
 
 /**
@@ -54,5 +57,10 @@ std::shared_ptr<InstrumentationSource> currentSource();
 /** Puts @p source in place of the configured one (tools and tests); a null
  *  pointer returns to the configuration at the next use. */
 void overrideSource(std::shared_ptr<InstrumentationSource> source);
+
+/** Has the current source raise a simulated alert; throws
+ *  std::runtime_error when it cannot (see
+ *  InstrumentationSource::raiseSimulatedAlert). */
+void raiseSimulatedAlert(SimulatedAlert alert);
 
 } // namespace QX::Platform

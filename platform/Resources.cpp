@@ -1,5 +1,6 @@
 #include "Resources.h"
 
+#include <atomic>
 #include <cstdlib>
 #include <string_view>
 
@@ -34,13 +35,35 @@ constexpr Message selProviderMessages[] = {
      L"Der Server wurde neu gestartet."},
 };
 
+// The configured language plus one, 0 for none (the environment decides).
+std::atomic<unsigned> configuredLanguage{0};
+
 } // namespace
 
 namespace Locale
 {
 
+void configureLanguage(const std::string& name)
+{
+    unsigned chosen = 0;
+    if (name == "en")
+    {
+        chosen = English + 1;
+    }
+    else if (name == "de")
+    {
+        chosen = German + 1;
+    }
+    configuredLanguage.store(chosen);
+}
+
 LanguageId getLanguageId()
 {
+    const unsigned chosen = configuredLanguage.load();
+    if (chosen != 0)
+    {
+        return static_cast<LanguageId>(chosen - 1);
+    }
     // The first of these that is set and not empty decides, as for
     // message catalogues.
     for (const char* variable : {"LC_ALL", "LC_MESSAGES", "LANG"})

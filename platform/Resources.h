@@ -25,9 +25,16 @@ struct ResourceLibrary
 /** Resource library of the SEL provider's messages. */
 constexpr unsigned SelProviderLibrary = 1;
 
-/** The language of the process: LC_ALL, LC_MESSAGES, then LANG; German
- *  for a "de" prefix, English otherwise. */
+/** The language of the messages: the one the platform configuration
+ *  chose (see configureLanguage), else that of the process: LC_ALL,
+ *  LC_MESSAGES, then LANG; German for a "de" prefix, English otherwise. */
 LanguageId getLanguageId();
+/**
+ * Fixes the language to "en" or "de" (the platform configuration's
+ * locale); any other text, the empty one included, returns to the process
+ * environment.
+ */
+void configureLanguage(const std::string& name);
 ResourceLibrary getResourceLibrary(unsigned library, LanguageId language);
 
 } // namespace Locale

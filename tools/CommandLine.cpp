@@ -1,8 +1,12 @@
 #include "CommandLine.h"
 
 #include "Names.h"
+#include "SimulatedAlert.h"
 
+#include <algorithm>
+#include <cmath>
 #include <cstddef>
+#include <cstdlib>
 
 namespace selprov
 {
@@ -33,6 +37,86 @@ std::vector<std::string> splitProperties(const std::string& list)
         }
         start = comma + 1;
     }
+}
+
+std::vector<std::string> splitList(const std::string& list, const char* what)
+{
+    std::vector<std::string> items;
+    std::size_t start = 0;
+    for (;;)
+    {
+        const std::size_t comma = list.find(',', start);
+        std::string item = list.substr(start, comma - start);
+        if (item.empty())
+        {
+            throw UsageError(std::string("empty item in ") + what);
+        }
+        items.push_back(std::move(item));
+        if (comma == std::string::npos)
+        {
+            return items;
+        }
+        start = comma + 1;
+    }
+}
+
+std::vector<std::string> watchedClasses(const std::string& list)
+{
+    std::vector<std::string> classes = splitList(list, "--classes");
+    for (const std::string& name : classes)
+    {
+        const auto& known = indicationClasses();
+        if (std::find(known.begin(), known.end(), name) == known.end())
+        {
+            throw UsageError("not an indication class of the provider: \"" +
+                             name + "\"");
+        }
+    }
+    return classes;
+}
+
+std::vector<std::string> alertNames(const std::string& list, const char* what)
+{
+    std::vector<std::string> alerts = splitList(list, what);
+    for (const std::string& name : alerts)
+    {
+        if (!QX::simulatedAlertFromName(name))
+        {
+            throw UsageError("unknown alert \"" + name + "\" (one of " +
+                             QX::simulatedAlertNames() + ")");
+        }
+    }
+    return alerts;
+}
+
+unsigned positiveCount(const std::string& text)
+{
+    if (text.empty() || text.size() > 9 ||
+        text.find_first_not_of("0123456789") != std::string::npos ||
+        std::stoul(text) == 0)
+    {
+        throw UsageError("--count needs a whole number from 1 to 999999999, "
+                         "not \"" +
+                         text + "\"");
+    }
+    return static_cast<unsigned>(std::stoul(text));
+}
+
+double positiveSeconds(const std::string& text)
+{
+    // Digits with at most one point: no signs, exponents or blanks.
+    const bool shaped =
+        !text.empty() && text.size() <= 12 &&
+        text.find_first_not_of("0123456789.") == std::string::npos &&
+        std::count(text.begin(), text.end(), '.') <= 1 && text != ".";
+    const double seconds = shaped ? std::strtod(text.c_str(), nullptr) : 0;
+    if (!shaped || !(seconds > 0) || seconds > 1e6)
+    {
+        throw UsageError("--timeout needs a number of seconds above 0 (at "
+                         "most 1000000), not \"" +
+                         text + "\"");
+    }
+    return seconds;
 }
 
 class Reader
@@ -98,6 +182,14 @@ void setOnce(std::optional<std::string>& slot, std::string value,
 
 } // namespace
 
+const std::vector<std::string>& indicationClasses()
+{
+    static const std::vector<std::string> classes = {
+        "ZAN_MgmtHwLogEntryEvent", "ZAN_MgmtHwLogClearEvent",
+        "ZAN_MgmtHwLogFullEvent", "ZANx_AutomaticServerRestartEvent"};
+    return classes;
+}
+
 const char* usageText()
 {
     return "usage: selprov [--library PATH] [--config FILE] [--namespace NS] "
@@ -108,6 +200,11 @@ const char* usageText()
            "  get OBJECTPATH [--properties P1,P2]\n"
            "  clear-log\n"
            "  invoke OBJECTPATH METHOD\n"
+           "  watch [--classes C1,C2] [--count N] [--timeout S] "
+           "[--raise KIND,...] [--json]\n"
+           "                    (subscribe, print indications as they "
+           "arrive, unsubscribe)\n"
+           "  raise KIND[,KIND...]   (have the simulated BMC raise alerts)\n"
            "  batch             (commands from standard input, one a line, "
            "in one process)\n"
            "  help\n"
@@ -116,6 +213,11 @@ const char* usageText()
            "Name=\"IPMI SEL\"'\n"
            "(the namespace may be left out). --properties \"\" asks for no "
            "properties.\n"
+           "KIND is entry, clear, warning, full or restart. watch "
+           "subscribes to all four\n"
+           "indication classes unless --classes names some, and runs "
+           "until N indications\n"
+           "arrived, S seconds passed or Ctrl-C.\n"
            "--library defaults to the installed provider library, or to "
            "../lib/libSELProvider.so beside the executable in a build "
            "tree;\n--config sets QX_PLATFORM_CONFIG; --timing writes each "
@@ -213,6 +315,62 @@ Options parseCommandLine(const std::vector<std::string>& args)
         {
             throw UsageError("bad method name \"" + o.method + "\"");
         }
+    }
+    else if (command == "watch")
+    {
+        o.command = Command::Watch;
+        o.classes = indicationClasses();
+        bool classesGiven = false;
+        while (!in.done())
+        {
+            if (auto classes = in.option("--classes"))
+            {
+                if (classesGiven)
+                {
+                    throw UsageError("--classes given twice");
+                }
+                classesGiven = true;
+                o.classes = watchedClasses(*classes);
+            }
+            else if (auto count = in.option("--count"))
+            {
+                if (o.count)
+                {
+                    throw UsageError("--count given twice");
+                }
+                o.count = positiveCount(*count);
+            }
+            else if (auto timeout = in.option("--timeout"))
+            {
+                if (o.timeout)
+                {
+                    throw UsageError("--timeout given twice");
+                }
+                o.timeout = positiveSeconds(*timeout);
+            }
+            else if (auto raise = in.option("--raise"))
+            {
+                if (!o.alerts.empty())
+                {
+                    throw UsageError("--raise given twice");
+                }
+                o.alerts = alertNames(*raise, "--raise");
+            }
+            else if (in.peek() == "--json")
+            {
+                in.next("--json");
+                o.json = true;
+            }
+            else
+            {
+                throw UsageError("unexpected argument \"" + in.peek() + "\"");
+            }
+        }
+    }
+    else if (command == "raise")
+    {
+        o.command = Command::Raise;
+        o.alerts = alertNames(in.next("alert kinds"), "raise");
     }
     else if (command == "batch")
     {

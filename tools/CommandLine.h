@@ -22,9 +22,14 @@ enum class Command
     Get,
     ClearLog,
     Invoke,
+    Watch,
+    Raise,
     Batch,
     Help,
 };
+
+// The indication classes watch subscribes to when none are named.
+const std::vector<std::string>& indicationClasses();
 
 struct Options
 {
@@ -37,6 +42,13 @@ struct Options
     std::string target; // class name or object path
     std::string method; // invoke
     std::optional<std::vector<std::string>> properties;
+    // watch: the classes to subscribe to, how many indications to wait
+    // for, for how long (seconds), and the alerts to raise once subscribed.
+    std::vector<std::string> classes;
+    std::optional<unsigned> count;
+    std::optional<double> timeout;
+    // watch --raise and raise: simulated alert names (entry, clear, ...).
+    std::vector<std::string> alerts;
     // The options given before the command, as typed; a batch applies them
     // to each of its lines.
     std::vector<std::string> globalArgs;

@@ -78,3 +78,16 @@ echo "\$ selprov --config memory.conf enumerate ZAN_MgmtHwLog --properties Name,
 printf 'source = memory\n' >"$bench/memory.conf"
 build/bin/selprov --config "$bench/memory.conf" \
     enumerate ZAN_MgmtHwLog --properties Name,CurrentNumberOfRecords
+
+# ---------------------------------------------------------------------------
+# Indications, on the in-memory sample SEL whatever else the platform is
+# configured for: subscribe to the four indication classes, have the
+# simulated BMC raise each kind of alert, print the indications as they
+# arrive, then unsubscribe.
+# ---------------------------------------------------------------------------
+memory_conf="$bench/indications.conf"
+printf 'source = memory\nlog.sink = none\n' >"$memory_conf"
+echo
+echo "\$ selprov --config memory.conf watch --raise entry,clear,warning,full,restart --count 5 --timeout 30"
+build/bin/selprov --config "$memory_conf" watch --raise entry,clear,warning,full,restart \
+    --count 5 --timeout 30

@@ -4,6 +4,7 @@
 #include "Host.h"
 #include "Printing.h"
 #include "StatusText.h"
+#include "Watch.h"
 
 #include <cerrno>
 #include <chrono>
@@ -218,6 +219,8 @@ host::Outcome run(const selprov::Options& o, host::Host& h)
                 printReturnValue(o, out);
             }
             break;
+        case Command::Watch:
+        case Command::Raise:
         case Command::Batch:
         case Command::Help:
             break;
@@ -235,6 +238,20 @@ int report(const host::Outcome& out)
     }
     std::cout.flush();
     return std::cout ? 0 : exitFailed;
+}
+
+// Runs one command and gives its exit code.
+int execute(const selprov::Options& o, host::Host& h)
+{
+    if (o.command == selprov::Command::Watch)
+    {
+        return selprov::watch(o, h);
+    }
+    if (o.command == selprov::Command::Raise)
+    {
+        return selprov::raise(o);
+    }
+    return report(run(o, h));
 }
 
 // Runs one command a line from standard input on the one loaded provider,
@@ -263,7 +280,7 @@ int runBatch(const selprov::Options& batch, host::Host& h)
             {
                 throw selprov::UsageError("not a request: \"" + line + "\"");
             }
-            code = report(run(options, h));
+            code = execute(options, h);
         }
         catch (const selprov::UsageError& e)
         {
@@ -321,7 +338,7 @@ int main(int argc, char** argv)
         {
             return runBatch(options, h);
         }
-        return report(run(options, h));
+        return execute(options, h);
     }
     catch (const host::LoadError& e)
     {

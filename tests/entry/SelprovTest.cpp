@@ -181,6 +181,61 @@ TEST_F(Selprov, LargeGeneratedLogIsServedWhole)
     EXPECT_EQ(countLines(names.output), 65535u);
 }
 
+TEST_F(Selprov, WatchPrintsTheIndicationOfEachRaisedAlert)
+{
+    const std::pair<const char*, const char*> cases[] = {
+        {"entry", "instance of ZAN_MgmtHwLogEntryEvent"},
+        {"clear", "instance of ZAN_MgmtHwLogClearEvent"},
+        {"warning", "EventID = \"IPMI Log Full Warning Event : "},
+        {"full", "EventID = \"IPMI Log Full Critical Event : "},
+        {"restart", "instance of ZANx_AutomaticServerRestartEvent"}};
+    for (const auto& [kind, expected] : cases)
+    {
+        const CommandResult watched = run(selprov() + "watch --raise " + kind +
+                                          " --count 1 --timeout 20");
+        EXPECT_EQ(watched.exitCode, 0) << kind;
+        EXPECT_NE(watched.output.find(expected), std::string::npos)
+            << kind << "\n"
+            << watched.output;
+        EXPECT_EQ(countLines(watched.output) > 10, true) << watched.output;
+    }
+}
+
+TEST_F(Selprov, WatchOnlyTheNamedClassesAsJson)
+{
+    const CommandResult watched =
+        run(selprov() + "watch --classes ZAN_MgmtHwLogClearEvent --raise "
+                        "entry,restart,clear --count 1 --timeout 20 --json");
+    EXPECT_EQ(watched.exitCode, 0);
+    EXPECT_EQ(countLines(watched.output), 1u) << watched.output;
+    EXPECT_EQ(watched.output.rfind("{\"path\": ", 0), 0u) << watched.output;
+    EXPECT_NE(watched.output.find("\"IndicationIdentifier\": \"IMPI SEL "
+                                  "Log\""),
+              std::string::npos)
+        << watched.output;
+}
+
+TEST_F(Selprov, WatchWithoutEnoughIndicationsTimesOut)
+{
+    const CommandResult watched =
+        run(selprov() + "watch --raise entry --count 2 --timeout 1", true);
+    EXPECT_EQ(watched.exitCode, 1);
+    EXPECT_NE(watched.output.find("timed out with 1 of 2 indications"),
+              std::string::npos)
+        << watched.output;
+}
+
+TEST_F(Selprov, RaiseInABatchChangesWhatLaterCommandsSee)
+{
+    const CommandResult batch =
+        run("printf 'raise entry,entry\\nenumerate-names "
+            "ZAN_MgmtHwLogEntry\\n' | " +
+            selprov() + "batch");
+    EXPECT_EQ(batch.exitCode, 0);
+    EXPECT_EQ(countLines(batch.output), 26u) << batch.output;
+    EXPECT_NE(batch.output.find("RecordID=\"26\""), std::string::npos);
+}
+
 TEST_F(Selprov, BrokenFixtureIsReportedNotCrashed)
 {
     const std::string fixture = (directory_ / "broken.fixture").string();

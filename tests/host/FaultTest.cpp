@@ -234,14 +234,26 @@ TEST_F(FaultTest, NewThread)
 
 TEST_F(FaultTest, DeliverIndication)
 {
+    host::IndicationInbox inbox = broker_.listen("root");
     broker_.faults().fail(BrokerCall::DeliverIndication);
     CMPIInstance* i = newInstance("root", "Alert");
     EXPECT_EQ(mb()->bft->deliverIndication(mb(), context(), "root", i).rc,
               CMPI_RC_ERR_FAILED);
-    EXPECT_TRUE(broker_.indications().empty());
+    EXPECT_EQ(inbox.pending(), 0u);
     EXPECT_EQ(mb()->bft->deliverIndication(mb(), context(), "root", i).rc,
               CMPI_RC_OK);
-    EXPECT_EQ(broker_.indications().size(), 1u);
+    EXPECT_EQ(inbox.pending(), 1u);
+    EXPECT_EQ(broker_.faults().calls(BrokerCall::DeliverIndication), 2u);
+}
+
+TEST_F(FaultTest, DetachThreadIsCountedAndStillDetaches)
+{
+    CMPIContext* prepared = mb()->bft->prepareAttachThread(mb(), context());
+    ASSERT_EQ(mb()->bft->attachThread(mb(), prepared).rc, CMPI_RC_OK);
+    broker_.faults().fail(BrokerCall::DetachThread);
+    EXPECT_EQ(mb()->bft->detachThread(mb(), prepared).rc, CMPI_RC_ERR_FAILED);
+    EXPECT_EQ(broker_.outstandingPreparedContexts(), 0u);
+    EXPECT_EQ(broker_.faults().calls(BrokerCall::DetachThread), 1u);
 }
 
 TEST_F(FaultTest, NullHandleObjectsAreRejectedByTheirFunctions)

@@ -87,6 +87,20 @@ TEST_F(SelprovCommand, UsageErrorsExitTwo)
         "--library",
         "--library a --library b clear-log",
         "--config /nonexistent/platform.conf clear-log",
+        "watch --classes ZAN_MgmtHwLog",
+        "watch --classes ZAN_MgmtHwLogEntryEvent,,ZAN_MgmtHwLogFullEvent",
+        "watch --count 0",
+        "watch --count -1",
+        "watch --count 12x",
+        "watch --timeout 0",
+        "watch --timeout 1e3",
+        "watch --timeout -2",
+        "watch --raise everything",
+        "watch --raise entry --raise clear",
+        "watch extra",
+        "raise",
+        "raise Entry",
+        "raise entry,",
     };
     for (const char* args : bad)
     {

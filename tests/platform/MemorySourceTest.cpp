@@ -3,6 +3,7 @@
 #include "Instrumentation.h"
 #include "platform/TestTrees.h"
 
+#include <chrono>
 #include <mutex>
 #include <stdexcept>
 #include <thread>
@@ -57,6 +58,7 @@ TEST_F(MemorySourceTest, ClearCommandEmptiesTheLogsOfThatController)
     EXPECT_TRUE(source->writeProperty("/bmc0", Command, ClearEventLogCommand));
     EXPECT_EQ(source->acceptedWrites(), 1u);
 
+    ASSERT_TRUE(source->waitForAlerts(std::chrono::seconds(10)));
     const auto after = source->snapshot();
     EXPECT_TRUE(
         after->nodesOfKind(EventLogEntry, *after->find("/bmc0")).empty());
@@ -126,6 +128,7 @@ TEST_F(MemorySourceTest, AppendEntryAddsTheNextPathAndAlerts)
         "/bmc0/sel", 4, "2024-05-01 10:00:00", "04 00 02", "Fan FAN1: low");
     EXPECT_EQ(path, "/bmc0/sel/entry-00004");
 
+    ASSERT_TRUE(source->waitForAlerts(std::chrono::seconds(10)));
     ASSERT_EQ(alerts.size(), 1u);
     EXPECT_EQ(alerts[0].code, AlertOnEventLogEntry);
     EXPECT_EQ(alerts[0].path, path);
@@ -155,6 +158,7 @@ TEST_F(MemorySourceTest, RaiseAlertUsesTheCodeOfTheKind)
     const DateTime when(2024, 3, 19, 17, 45, 3, 0, 1);
     source->raiseAlert("/bmc0/wdt", when);
     source->raiseAlert("/bmc1/sel", when);
+    ASSERT_TRUE(source->waitForAlerts(std::chrono::seconds(10)));
     ASSERT_EQ(alerts.size(), 2u);
     EXPECT_EQ(alerts[0].code, AlertOnWatchdog);
     EXPECT_EQ(alerts[0].path, "/bmc0/wdt");
@@ -176,6 +180,7 @@ TEST_F(MemorySourceTest, StopMonitoringRemovesOneMatchingRegistration)
     source->stopMonitoring(EventLog, &recordAlert, &a); // no such registration
     EXPECT_EQ(source->monitorCount(Watchdog), 1u);
     source->raiseAlert("/bmc0/wdt", DateTime());
+    ASSERT_TRUE(source->waitForAlerts(std::chrono::seconds(10)));
     ASSERT_EQ(alerts.size(), 1u);
     EXPECT_EQ(alerts[0].context, &a);
 }
@@ -199,6 +204,7 @@ TEST_F(MemorySourceTest, CallbacksMayCallBackIntoTheSource)
     reentrantSource = source.get();
     source->startMonitoring(EventLogEntry, &reenter, nullptr);
     source->appendEntry("/bmc1/sel", 3, "", "", "");
+    ASSERT_TRUE(source->waitForAlerts(std::chrono::seconds(10)));
     EXPECT_EQ(source->monitorCount(EventLogEntry), 0u);
     reentrantSource = nullptr;
 }

@@ -3,6 +3,7 @@
 #include "CVLogger.h"
 #include "Instrumentation.h"
 #include "MemorySource.h"
+#include "Resources.h"
 #include "platform/EnvironmentGuard.h"
 #include "platform/TestTrees.h"
 
@@ -93,6 +94,20 @@ TEST(Configuration, DefaultsWhenEmpty)
     EXPECT_EQ(configuration.logLevel, 6000);
     EXPECT_EQ(configuration.traceLevel, 0);
     EXPECT_EQ(configuration.logComponents, "*");
+    EXPECT_EQ(configuration.locale, "");
+}
+
+TEST(Configuration, LocaleIsEnglishGermanOrTheEnvironment)
+{
+    EXPECT_EQ(Platform::parseConfiguration("locale = de\n", "x").locale, "de");
+    EXPECT_EQ(Platform::parseConfiguration("locale=en", "x").locale, "en");
+    EXPECT_EQ(Platform::parseConfiguration("locale =\n", "x").locale, "");
+    EXPECT_EQ(configurationError("locale = fr\n"),
+              "platform.conf:1: locale must be en or de (or empty for the "
+              "environment), not \"fr\"");
+    EXPECT_EQ(configurationError("locale = de_DE\n"),
+              "platform.conf:1: locale must be en or de (or empty for the "
+              "environment), not \"de_DE\"");
 }
 
 TEST(Configuration, ParsesEveryKey)
@@ -246,6 +261,26 @@ TEST_F(PlatformTest, MissingFixtureFileFailsWithItsName)
         EXPECT_THAT(error.what(), HasSubstr("/nonexistent/sel.fixture"));
     }
     ::testing::internal::GetCapturedStderr();
+}
+
+TEST_F(PlatformTest, TheConfiguredLocaleChoosesTheLanguage)
+{
+    environment_.unset("LC_ALL");
+    environment_.unset("LC_MESSAGES");
+    environment_.set("LANG", "en_US.UTF-8");
+    const TempFile german("locale = de\nlog.sink = none\n");
+    environment_.set(Platform::configurationPathVariable, german.path());
+    Platform::overrideSource(nullptr);
+    static_cast<void>(Platform::currentSource());
+    EXPECT_EQ(Locale::getLanguageId(), Locale::German);
+
+    const TempFile unset("log.sink = none\n");
+    environment_.set(Platform::configurationPathVariable, unset.path());
+    Platform::overrideSource(nullptr);
+    static_cast<void>(Platform::currentSource());
+    EXPECT_EQ(Locale::getLanguageId(), Locale::English);
+    environment_.set("LANG", "de_CH.UTF-8");
+    EXPECT_EQ(Locale::getLanguageId(), Locale::German);
 }
 
 TEST_F(PlatformTest, OverrideSourceReplacesAndNullRereads)

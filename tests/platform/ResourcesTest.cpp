@@ -90,6 +90,23 @@ TEST(Resources, LanguageFollowsTheEnvironment)
     EXPECT_EQ(getLanguageId(), English);
 }
 
+TEST(Resources, AConfiguredLanguageOverridesTheEnvironment)
+{
+    test::EnvironmentGuard environment;
+    environment.unset("LC_ALL");
+    environment.unset("LC_MESSAGES");
+    environment.set("LANG", "en_GB.UTF-8");
+    configureLanguage("de");
+    EXPECT_EQ(getLanguageId(), German);
+    environment.set("LANG", "de_DE.UTF-8");
+    configureLanguage("en");
+    EXPECT_EQ(getLanguageId(), English);
+    configureLanguage("fr"); // not a language of ours: the environment
+    EXPECT_EQ(getLanguageId(), German);
+    configureLanguage("");
+    EXPECT_EQ(getLanguageId(), German);
+}
+
 TEST(MakeString, EncodesUtf8ByHand)
 {
     EXPECT_EQ(make_string(std::wstring(L"plain ASCII")), "plain ASCII");

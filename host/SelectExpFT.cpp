@@ -1,0 +1,73 @@
+// The select expression handed to an indication MI: it carries the query
+// and its language. Evaluation is the object manager's business here, so
+// the condition and evaluation functions are not offered.
+#include "BrokerState.h"
+#include "Objects.h"
+
+namespace host::detail
+{
+namespace
+{
+
+using Exp = SelectExpObject;
+
+CMPIStatus expRelease(CMPISelectExp* se)
+{
+    return releaseObject<Exp>(se);
+}
+
+CMPISelectExp* expClone(const CMPISelectExp* se, CMPIStatus* rc)
+{
+    return cloneObject<Exp>(se, rc,
+                            [](auto& to, const auto& from)
+                            {
+                                to.query = from.query;
+                                to.language = from.language;
+                            });
+}
+
+CMPIBoolean expEvaluate(const CMPISelectExp* se, const CMPIInstance*,
+                        CMPIStatus* rc)
+{
+    setStatus(rc, Exp::of(se) ? CMPI_RC_ERR_NOT_SUPPORTED
+                              : CMPI_RC_ERR_INVALID_HANDLE);
+    return 0;
+}
+
+CMPIString* expGetString(const CMPISelectExp* se, CMPIStatus* rc)
+{
+    const Exp* e = Exp::of(se);
+    if (e == nullptr)
+    {
+        setStatus(rc, CMPI_RC_ERR_INVALID_HANDLE);
+        return nullptr;
+    }
+    auto* s = e->broker->make<StringObject>();
+    s->text = e->query;
+    setStatus(rc, CMPI_RC_OK);
+    return &s->cmpi;
+}
+
+CMPISelectCond* expGetCondition(const CMPISelectExp* se, CMPIStatus* rc)
+{
+    setStatus(rc, Exp::of(se) ? CMPI_RC_ERR_NOT_SUPPORTED
+                              : CMPI_RC_ERR_INVALID_HANDLE);
+    return nullptr;
+}
+
+CMPIBoolean expEvaluateUsingAccessor(const CMPISelectExp* se, CMPIAccessor*,
+                                     void*, CMPIStatus* rc)
+{
+    setStatus(rc, Exp::of(se) ? CMPI_RC_ERR_NOT_SUPPORTED
+                              : CMPI_RC_ERR_INVALID_HANDLE);
+    return 0;
+}
+
+} // namespace
+
+CMPISelectExpFT selectExpFT = {
+    200,          expRelease,      expClone,        expEvaluate,
+    expGetString, expGetCondition, expGetCondition, expEvaluateUsingAccessor,
+};
+
+} // namespace host::detail

@@ -1,0 +1,236 @@
+#include "IndicationBuilding.h"
+
+#include "CIMDateTime.h"
+#include "CmpiValues.h"
+#include "IndicationTrace.h"
+#include "Resources.h"
+#include "Support.h"
+
+#include <algorithm>
+#include <cwchar>
+#include <vector>
+
+namespace QX::SELComposite::indication
+{
+
+namespace
+{
+
+/** What a resource text asks of printf when used as a format. */
+struct FormatUse
+{
+    unsigned integers = 0; // %d and %i conversions
+    bool other = false;    // any conversion that would need another type
+};
+
+bool isDigit(wchar_t c)
+{
+    return c >= L'0' && c <= L'9';
+}
+
+FormatUse formatUseOf(const std::wstring& text)
+{
+    FormatUse use;
+    const std::size_t size = text.size();
+    for (std::size_t i = 0; i < size; ++i)
+    {
+        if (text[i] != L'%')
+        {
+            continue;
+        }
+        if (++i == size)
+        {
+            use.other = true;
+            break;
+        }
+        if (text[i] == L'%')
+        {
+            continue;
+        }
+        while (i < size && std::wcschr(L"-+ #0", text[i]) != nullptr &&
+               text[i] != L'\0')
+        {
+            ++i;
+        }
+        while (i < size && isDigit(text[i]))
+        {
+            ++i;
+        }
+        if (i < size && text[i] == L'.')
+        {
+            ++i;
+            while (i < size && isDigit(text[i]))
+            {
+                ++i;
+            }
+        }
+        if (i < size && (text[i] == L'd' || text[i] == L'i'))
+        {
+            ++use.integers;
+        }
+        else
+        {
+            use.other = true;
+        }
+    }
+    return use;
+}
+
+/** The resource text of @p identifier in the current language. */
+std::wstring resourceText(const wchar_t* identifier)
+{
+    const Locale::LanguageId languageId = Locale::getLanguageId();
+    const Locale::ResourceLibrary library =
+        Locale::getResourceLibrary(Locale::SelProviderLibrary, languageId);
+    return ResourceString(library, identifier).str();
+}
+
+/** @p text copied as it stands, cut to the buffer: used when the text
+ *  holds conversions the call has no arguments for. */
+void copyInto(std::vector<wchar_t>& buffer, const std::wstring& text)
+{
+    const std::size_t length = std::min(text.size(), buffer.size() - 1);
+    std::wmemcpy(buffer.data(), text.data(), length);
+    buffer[length] = L'\0';
+}
+
+void terminate(std::vector<wchar_t>& buffer)
+{
+    buffer.back() = L'\0';
+}
+
+} // namespace
+
+CMPIInstance* newEventInstance(const CMPIBroker* broker, const char* className,
+                               const char* function, CMPIObjectPath** path)
+{
+    CMPIStatus status{CMPI_RC_OK, nullptr};
+    CMPIObjectPath* eventPath = broker->eft->newObjectPath(
+        broker, INDICATION_NAMESPACE, className, &status);
+    if (!isUsable(eventPath))
+    {
+        traceMessage(function, __LINE__, LOG_LEVEL_FAILURE,
+                     "Failed to create ObjectPath");
+        return nullptr;
+    }
+    eventPath->ft->setNameSpace(eventPath, INDICATION_NAMESPACE);
+    const std::string hostName = getSystemName();
+    eventPath->ft->setHostname(eventPath, hostName.c_str());
+    if (path != nullptr)
+    {
+        *path = eventPath;
+    }
+    return broker->eft->newInstance(broker, eventPath, &status);
+}
+
+CMPIDateTime* newAlertTime(const CMPIBroker* broker, const DateTime& time)
+{
+    const std::string text = convertCIMDateTime(time);
+    CMPIStatus status{CMPI_RC_OK, nullptr};
+    return broker->eft->newDateTimeFromChars(broker, text.c_str(), &status);
+}
+
+CMPIObjectPath* newAlertingElementPath(const CMPIBroker* broker,
+                                       const char* className,
+                                       const char* function)
+{
+    CMPIStatus status{CMPI_RC_OK, nullptr};
+    CMPIObjectPath* path = broker->eft->newObjectPath(
+        broker, INDICATION_NAMESPACE, className, &status);
+    if (!isUsable(path))
+    {
+        traceMessage(function, __LINE__, LOG_LEVEL_FAILURE,
+                     "Failed to create ObjectPath for Alerting Managed "
+                     "Element");
+        return nullptr;
+    }
+    return path;
+}
+
+void keepNamespaceAndSetHost(CMPIObjectPath* path)
+{
+    // Setting the namespace the path already reports changes nothing; it
+    // is done all the same, as object managers have always seen it.
+    const std::string nameSpace = [path]
+    {
+        const char* chars =
+            charsOf(path->ft->getNameSpace(path, nullptr), nullptr);
+        return std::string(chars != nullptr ? chars : "");
+    }();
+    path->ft->setNameSpace(path, nameSpace.c_str());
+    const std::string hostName = getSystemName();
+    path->ft->setHostname(path, hostName.c_str());
+}
+
+std::string pathText(const CMPIObjectPath* path)
+{
+    const char* chars = charsOf(path->ft->toString(path, nullptr), nullptr);
+    return chars != nullptr ? chars : "";
+}
+
+void addTextKey(CMPIObjectPath* path, const char* name, const char* value)
+{
+    path->ft->addKey(path, name, reinterpret_cast<const CMPIValue*>(value),
+                     CMPI_chars);
+}
+
+void setNoCorrelatedIndications(const CMPIBroker* broker,
+                                CMPIInstance* instance)
+{
+    CMPIStatus status{CMPI_RC_OK, nullptr};
+    CMPIArray* none = broker->eft->newArray(broker, 0, CMPI_string, &status);
+    setArrayProperty(instance, "CorrelatedIndications", none, CMPI_stringA);
+}
+
+void setCommonTail(CMPIInstance* instance)
+{
+    setTextProperty(instance, "SystemCreationClassName",
+                    "ZANKOR_ComputerSystem");
+    const std::string systemName = getSystemName();
+    setTextProperty(instance, "SystemName", systemName.c_str());
+    setTextProperty(instance, "OwningEntity", "ZAN");
+    setTextProperty(instance, "ProviderName", "SELProvider");
+    const std::string uid = make_string(Product::getUid());
+    setTextProperty(instance, "UniqueSystemID", uid.c_str());
+}
+
+std::string localizedMessage(const wchar_t* identifier)
+{
+    std::vector<wchar_t> buffer(messageBufferSize, L'\0');
+    const std::wstring text = resourceText(identifier);
+    const FormatUse use = formatUseOf(text);
+    if (use.integers == 0 && !use.other)
+    {
+        std::swprintf(buffer.data(), buffer.size(), text.c_str());
+        terminate(buffer);
+    }
+    else
+    {
+        // A conversion without its argument would read garbage.
+        copyInto(buffer, text);
+    }
+    return make_string(buffer.data());
+}
+
+std::string localizedMessage(const wchar_t* identifier, int argument)
+{
+    std::vector<wchar_t> buffer(fullMessageBufferSize, L'\0');
+    const std::wstring text = resourceText(identifier);
+    if (text.empty())
+    {
+        return make_string(buffer.data());
+    }
+    const FormatUse use = formatUseOf(text);
+    if (use.integers <= 1 && !use.other)
+    {
+        std::swprintf(buffer.data(), buffer.size(), text.c_str(), argument);
+        terminate(buffer);
+    }
+    else
+    {
+        copyInto(buffer, text);
+    }
+    return make_string(buffer.data());
+}
+
+} // namespace QX::SELComposite::indication

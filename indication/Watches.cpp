@@ -1,0 +1,90 @@
+#include "Watches.h"
+
+#include "Instrumentation.h"
+#include "Platform.h"
+
+#include <algorithm>
+#include <exception>
+#include <iostream>
+
+namespace QX::SELComposite
+{
+
+void Watches::start(NodeLexicon::NodeType kind, MonitorCallback handler)
+{
+    try
+    {
+        auto source = Platform::currentSource();
+        {
+            Instrumentation cursor(source);
+            cursor.startMonitoring(kind, handler, nullptr);
+        }
+        const std::lock_guard lock(mutex_);
+        registrations_.push_back(Registration{source, kind, handler});
+    }
+    catch (const std::exception& error)
+    {
+        std::cerr << error.what() << std::endl;
+    }
+}
+
+void Watches::stop(NodeLexicon::NodeType kind, MonitorCallback handler)
+{
+    try
+    {
+        auto source = Platform::currentSource();
+        {
+            Instrumentation cursor(source);
+            cursor.stopMonitoring(kind, handler, nullptr);
+        }
+        const std::lock_guard lock(mutex_);
+        const auto found =
+            std::find_if(registrations_.begin(), registrations_.end(),
+                         [&](const Registration& registration)
+                         {
+                             return registration.kind == kind &&
+                                    registration.handler == handler &&
+                                    registration.source.lock() == source;
+                         });
+        if (found != registrations_.end())
+        {
+            registrations_.erase(found);
+        }
+    }
+    catch (const std::exception& error)
+    {
+        std::cerr << error.what() << std::endl;
+    }
+}
+
+void Watches::releaseAll() noexcept
+{
+    std::vector<Registration> remaining;
+    {
+        const std::lock_guard lock(mutex_);
+        remaining.swap(registrations_);
+    }
+    for (const Registration& registration : remaining)
+    {
+        try
+        {
+            if (const auto source = registration.source.lock())
+            {
+                source->stopMonitoring(registration.kind, registration.handler,
+                                       nullptr);
+            }
+        }
+        catch (...)
+        {
+            // Nothing more can be done for this one while unloading.
+        }
+    }
+}
+
+std::size_t Watches::held() const
+{
+    const std::lock_guard lock(mutex_);
+    return registrations_.size();
+}
+
+} // namespace QX::SELComposite
