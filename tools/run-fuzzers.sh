@@ -15,9 +15,7 @@ cd "$(dirname "$0")/.."
 seconds=${FUZZ_SECONDS:-30}
 build=build-fuzz
 
-if ! command -v clang++-14 >/dev/null; then
-    tools/setup-deps.sh
-fi
+tools/setup-deps.sh
 
 echo "== fuzz build"
 CC=clang-14 CXX=clang++-14 cmake -S . -B "$build" -G Ninja \

@@ -4,7 +4,8 @@
 set -euo pipefail
 
 packages=(cmake ninja-build g++ pkg-config googletest libgtest-dev
-          libgmock-dev libbenchmark-dev clang-format)
+          libgmock-dev libbenchmark-dev clang-format
+          clang-14 libclang-rt-14-dev)
 
 missing=()
 for package in "${packages[@]}"; do
