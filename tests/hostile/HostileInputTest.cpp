@@ -181,6 +181,13 @@ std::vector<Case> cases()
          [=](const Call& c)
          { return names(c, nullptr, c.result, c.path(entries())); },
          enumerated(entryCount, 0)},
+        {"NamesNullMI",
+         [=](const Call& c)
+         {
+             return c.instanceMI->ft->enumerateInstanceNames(
+                 nullptr, c.context, c.result, c.path(entries()));
+         },
+         enumerated(entryCount, 0)},
         {"NamesNullResult",
          [=](const Call& c)
          { return names(c, c.context, nullptr, c.path(entries())); },
@@ -338,6 +345,14 @@ std::vector<Case> cases()
              return get(c, c.context, c.result, c.path(path), nullptr);
          },
          enumerated(0, 0)},
+        {"GetLogNameOfTheWrongType",
+         [](const Call& c)
+         {
+             ObjectPath path = logPath();
+             path.setKey("Name", Value::signedInt(CMPI_sint64, -1));
+             return get(c, c.context, c.result, c.path(path), nullptr);
+         },
+         enumerated(0, 0)},
         {"GetWithoutKeys",
          [=](const Call& c)
          { return get(c, c.context, c.result, c.path(entries()), nullptr); },
@@ -361,6 +376,30 @@ std::vector<Case> cases()
          {
              return invoke(c, nullptr, c.result, c.path(logPath()), "ClearLog",
                            c.broker.makeArgs(), c.broker.makeArgs());
+         },
+         methodValue(0)},
+        {"ClearLogNullMI",
+         [](const Call& c)
+         {
+             return c.methodMI->ft->invokeMethod(nullptr, c.context, c.result,
+                                                 c.path(logPath()), "ClearLog",
+                                                 nullptr, nullptr);
+         },
+         methodValue(0)},
+        {"ClearLogThousandKeys",
+         [](const Call& c)
+         {
+             return invoke(c, c.context, c.result,
+                           c.path(withManyKeys(logPath(), 1000)), "ClearLog",
+                           nullptr, nullptr);
+         },
+         methodValue(0)},
+        {"ClearLogInvalidUtf8ClassName",
+         [](const Call& c)
+         {
+             return invoke(c, c.context, c.result,
+                           c.path(withClass(invalidUtf8)), "ClearLog", nullptr,
+                           nullptr);
          },
          methodValue(0)},
         {"ClearLogNullResult",
