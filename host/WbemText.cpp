@@ -256,6 +256,11 @@ class PathParser
             {
                 return out;
             }
+            if (c == '\0')
+            {
+                --pos_;
+                fail("NUL in a quoted value");
+            }
             if (c != '\\')
             {
                 out += c;
@@ -281,12 +286,32 @@ class PathParser
                 case 't':
                     out += '\t';
                     break;
+                case 'x':
+                    out += hexEscape();
+                    break;
                 default:
                     --pos_;
                     fail(std::string("unknown escape \\") + e);
             }
         }
         fail("unterminated quoted value");
+    }
+
+    // \xNN, as quoted() writes the other control characters; NUL cannot
+    // travel in a CMPI string and is refused.
+    char hexEscape()
+    {
+        unsigned code = 0;
+        const char* const digits = text_.data() + pos_;
+        const auto r = std::from_chars(
+            digits, digits + std::min<std::size_t>(2, text_.size() - pos_),
+            code, 16);
+        if (r.ec != std::errc() || r.ptr != digits + 2 || code == 0)
+        {
+            fail("\\x must be followed by two hex digits other than 00");
+        }
+        pos_ += 2;
+        return static_cast<char>(code);
     }
 
     // Keys of a known class take the class's type when the text fits it;

@@ -30,6 +30,18 @@ CMPIStatus boundaryFailure(const char* what)
     return status;
 }
 
+CMPIStatus missingArgument(const char* what)
+{
+    CMPIStatus status = statusOf(CMPI_RC_ERR_FAILED);
+    const CMPIBroker* current = broker.load();
+    if (current != nullptr)
+    {
+        const std::string text = std::string("No ") + what + " was passed";
+        status.msg = current->eft->newString(current, text.c_str(), nullptr);
+    }
+    return status;
+}
+
 CMPIStatus SEL_Cleanup(CMPIInstanceMI*, const CMPIContext*, CMPIBoolean)
 {
     return statusOf(CMPI_RC_OK);

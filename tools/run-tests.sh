@@ -1,6 +1,7 @@
 #!/usr/bin/env bash
 # Builds and runs every test: the plain build (warnings as errors, format
-# check), then the ASan+UBSan build and the TSan build.
+# check), then the ASan+UBSan build and the TSan build, then each fuzz
+# target for a bounded time (FUZZ_SECONDS, default 30).
 set -euo pipefail
 cd "$(dirname "$0")/.."
 
@@ -25,3 +26,6 @@ for preset in default asan tsan; do
         tools/check-package.sh build
     fi
 done
+
+echo "== fuzzers"
+tools/run-fuzzers.sh

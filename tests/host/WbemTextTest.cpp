@@ -2,6 +2,7 @@
 #include "Values.h"
 
 #include <stdexcept>
+#include <string_view>
 
 #include <gtest/gtest.h>
 
@@ -133,6 +134,29 @@ TEST(WbemText, RejectsBadText)
     {
         EXPECT_THROW(ObjectPath::parse(text), std::invalid_argument) << text;
     }
+}
+
+TEST(WbemText, ControlCharactersReadBackAsPrinted)
+{
+    ObjectPath path;
+    path.nameSpace = "root";
+    path.className = "C";
+    path.setKey("K", Value::string(std::string("a\x15"
+                                               "b\x01\x1f\n")));
+    const std::string text = path.toString();
+    EXPECT_EQ(text, "root:C.K=\"a\\x15b\\x01\\x1F\\n\"");
+    EXPECT_EQ(ObjectPath::parse(text), path);
+    EXPECT_EQ(*ObjectPath::parse("root:C.K=\"\\x7e\"").key("K"),
+              Value::string("~"));
+    for (const char* bad : {"root:C.K=\"\\x00\"", "root:C.K=\"\\x1\"",
+                            "root:C.K=\"\\xg1\"", "root:C.K=\"\\x\""})
+    {
+        EXPECT_THROW(ObjectPath::parse(bad), std::invalid_argument) << bad;
+    }
+    // A NUL cannot travel in a CMPI string, written raw or escaped.
+    using namespace std::string_view_literals;
+    EXPECT_THROW(ObjectPath::parse("root:C.K=\"a\0b\""sv),
+                 std::invalid_argument);
 }
 
 TEST(WbemText, ErrorMessageNamesTheText)

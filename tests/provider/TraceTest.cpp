@@ -4,6 +4,7 @@
 #include "TestSupport.h"
 
 #include <cstring>
+#include <limits>
 #include <string>
 #include <thread>
 
@@ -32,9 +33,19 @@ TEST(TraceFormat, EntryExitAndMethodLines)
                  "METHOD: clearLog() was invoked in SEL.cpp [Line: 14]");
 }
 
+template <typename Enum>
+concept TakesEveryInt = requires
+{
+    Enum{-1};
+};
+
 TEST(TraceFormat, UnknownKindsGiveEnteringLines)
 {
-    for (const int kind : {0, 4, 5, 1000})
+    // Without a fixed underlying type a kind such as 4 or -1 would not be a
+    // value of MessageType at all, and the comparisons below undefined.
+    static_assert(TakesEveryInt<QX::MessageType>);
+    for (const int kind : {0, 4, 5, 1000, -1, std::numeric_limits<int>::max(),
+                           std::numeric_limits<int>::min()})
     {
         EXPECT_STREQ(
             QX::trace("f", "SEL.cpp", 1, static_cast<QX::MessageType>(kind)),

@@ -10,8 +10,10 @@
 namespace QX
 {
 
-/** Kinds of lines made by the message-kind trace formatter. */
-enum MessageType
+/** Kinds of lines made by the message-kind trace formatter. The underlying
+ *  type is fixed so that every int is a value of the type: callers may pass
+ *  kinds outside the four names, which format as ENTERING lines. */
+enum MessageType : int
 {
     ENTRY_TRACE = 0,
     EXIT_TRACE = 1,
