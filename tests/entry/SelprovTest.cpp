@@ -23,7 +23,7 @@ struct CommandResult
 CommandResult run(const std::string& commandLine, bool withErrors = false)
 {
     const std::string full =
-        "timeout 60 " + commandLine + (withErrors ? " 2>&1" : " 2>/dev/null");
+        "timeout 180 " + commandLine + (withErrors ? " 2>&1" : " 2>/dev/null");
     CommandResult result;
     FILE* pipe = ::popen(full.c_str(), "r");
     if (pipe == nullptr)
