@@ -70,21 +70,17 @@ void print(const Options& options, const host::DeliveredIndication& got)
     std::cout.flush();
 }
 
-int raiseAll(const std::vector<std::string>& alerts)
+int raiseOne(const std::string& name)
 {
-    for (const std::string& name : alerts)
+    try
     {
-        try
-        {
-            QX::Platform::raiseSimulatedAlert(
-                *QX::simulatedAlertFromName(name));
-        }
-        catch (const std::exception& error)
-        {
-            std::cerr << "selprov: cannot raise " << name << ": "
-                      << error.what() << "\n";
-            return 1;
-        }
+        QX::Platform::raiseSimulatedAlert(*QX::simulatedAlertFromName(name));
+    }
+    catch (const std::exception& error)
+    {
+        std::cerr << "selprov: cannot raise " << name << ": " << error.what()
+                  << "\n";
+        return 1;
     }
     return 0;
 }
@@ -93,7 +89,14 @@ int raiseAll(const std::vector<std::string>& alerts)
 
 int raise(const Options& options)
 {
-    return raiseAll(options.alerts);
+    for (const std::string& name : options.alerts)
+    {
+        if (raiseOne(name) != 0)
+        {
+            return 1;
+        }
+    }
+    return 0;
 }
 
 int watch(const Options& options, host::Host& host)
@@ -128,7 +131,6 @@ int watch(const Options& options, host::Host& host)
         std::cerr << "selprov: watching " << active.size()
                   << " indication class" << (active.size() == 1 ? "" : "es")
                   << " in " << options.nameSpace << "\n";
-        result = raiseAll(options.alerts);
     }
     unsigned received = 0;
     const auto deadline =
@@ -137,15 +139,30 @@ int watch(const Options& options, host::Host& host)
                   std::chrono::duration_cast<Clock::duration>(
                       std::chrono::duration<double>(*options.timeout))
             : Clock::time_point::max();
+    // The alerts go one at a time: the next once the last one's indication
+    // arrived (or a second passed), since a delivery reads the hardware as
+    // it is then, and a later alert may have changed it.
+    constexpr auto raisePause = std::chrono::seconds(1);
+    std::size_t raised = 0;
+    bool answered = true;
+    auto lastRaise = Clock::now();
     while (result == 0 && (!options.count || received < *options.count) &&
            interrupted == 0)
     {
-        const auto now = Clock::now();
+        auto now = Clock::now();
+        if (raised < options.alerts.size() &&
+            (answered || now - lastRaise >= raisePause))
+        {
+            result = raiseOne(options.alerts[raised++]);
+            lastRaise = now;
+            answered = false;
+            continue;
+        }
         if (now >= deadline)
         {
             break;
         }
-        // Short waits, so that Ctrl-C is seen promptly.
+        // Short waits, so that Ctrl-C and the next alert come promptly.
         const auto slice = std::min<Clock::duration>(
             deadline - now, std::chrono::milliseconds(100));
         if (const auto got = inbox.next(
@@ -154,6 +171,7 @@ int watch(const Options& options, host::Host& host)
         {
             print(options, *got);
             ++received;
+            answered = true;
         }
     }
     if (result == 0 && options.count && received < *options.count)

@@ -201,6 +201,24 @@ TEST_F(Selprov, WatchPrintsTheIndicationOfEachRaisedAlert)
     }
 }
 
+TEST_F(Selprov, WatchRaisesSeveralAlertsOneAfterTheOther)
+{
+    const CommandResult watched =
+        run(selprov() + "watch --raise entry,clear,warning,full,restart "
+                        "--count 5 --timeout 30");
+    EXPECT_EQ(watched.exitCode, 0);
+    std::size_t at = 0;
+    for (const char* expected :
+         {"instance of ZAN_MgmtHwLogEntryEvent",
+          "instance of ZAN_MgmtHwLogClearEvent", "IPMI Log Full Warning Event",
+          "IPMI Log Full Critical Event",
+          "instance of ZANx_AutomaticServerRestartEvent"})
+    {
+        at = watched.output.find(expected, at);
+        EXPECT_NE(at, std::string::npos) << expected << "\n" << watched.output;
+    }
+}
+
 TEST_F(Selprov, WatchOnlyTheNamedClassesAsJson)
 {
     const CommandResult watched =
