@@ -1,5 +1,15 @@
 #include "ExpectedIndications.h"
 
+#include "CVLogger.h"
+#include "Host.h"
+#include "MemorySource.h"
+#include "NodeTree.h"
+#include "Platform.h"
+#include "ProvidedInstances.h"
+
+#include <chrono>
+#include <memory>
+#include <stdexcept>
 #include <string>
 
 namespace deploy
@@ -8,89 +18,66 @@ namespace deploy
 namespace
 {
 
+using namespace QX::NodeLexicon;
+
 constexpr const char* nameSpace = "root/zanqx";
-constexpr const char* someTime = "20240304081522.000000+000";
+constexpr std::chrono::seconds patience{10};
 
-host::Value text(std::string value)
+std::shared_ptr<const QX::NodeTree> treeWithWatchdog()
 {
-    return host::Value::string(std::move(value));
+    QX::NodeTreeBuilder tree;
+    tree.addNode(ManagementController, "/bmc0", "", "BMC", 1);
+    tree.addNode(EventLog, "/bmc0/sel", "/bmc0", "System Event Log", 1);
+    tree.setProperty("/bmc0/sel", Name, std::string("IPMI SEL Log"));
+    tree.setProperty("/bmc0/sel", MaxRecords, 512u);
+    tree.setProperty("/bmc0/sel", IsEmpty, false);
+    tree.addNode(Watchdog, "/bmc0/wdt", "/bmc0", "Watchdog 2", 1);
+    tree.setProperty("/bmc0/wdt", RestartCause, 4u);
+    return tree.build();
 }
 
-host::Value number(std::uint64_t value)
+std::vector<host::Instance> deliverOneOfEach()
 {
-    return host::Value::unsignedInt(CMPI_uint16, value);
-}
-
-host::ObjectPath pathOf(const std::string& className)
-{
-    host::ObjectPath path;
-    path.nameSpace = nameSpace;
-    path.className = className;
-    path.host = "server.example";
-    return path;
-}
-
-// The alerting element of a log entry event: the new record.
-std::string entryPath()
-{
-    host::ObjectPath path = pathOf("ZAN_MgmtHwLogEntry");
-    path.setKey("LogCreationClassName", text("ZAN_MgmtHwLog"));
-    path.setKey("CreationClassName", text("ZAN_MgmtHwLogEntry"));
-    path.setKey("LogName", text("IPMI SEL Log"));
-    path.setKey("RecordID", text("42"));
-    path.setKey("MessageTimestamp", host::Value::dateTime(someTime));
-    return path.toString();
-}
-
-// The alerting element of the clear and full events: the log.
-std::string logPath()
-{
-    host::ObjectPath path = pathOf("ZAN_MgmtHwLog");
-    path.setKey("CreationClassName", text("ZAN_MgmtHwLog"));
-    path.setKey("Name", text("IMPI SEL Log"));
-    return path.toString();
-}
-
-// Every builder sets the same seventeen properties with the same types;
-// they differ in their values and in the element they name.
-host::Instance indication(const std::string& className,
-                          const std::string& alertingElement)
-{
-    host::Instance i;
-    i.path = pathOf(className);
-    i.setProperty("IndicationIdentifier", text("IPMI SEL Log"));
-    i.setProperty("EventID", text("event"));
-    i.setProperty("IndicationTime", host::Value::dateTime(someTime));
-    i.setProperty("EventTime", host::Value::dateTime(someTime));
-    i.setProperty("AlertingManagedElement", text(alertingElement));
-    i.setProperty("CorrelatedIndications", host::Value::array(CMPI_string, {}));
-    i.setProperty("Message", text("message"));
-    i.setProperty("Description", text("message"));
-    i.setProperty("PerceivedSeverity", number(2));
-    i.setProperty("AlertingElementFormat", number(2));
-    i.setProperty("AlertType", number(3));
-    i.setProperty("ProbableCause", number(1));
-    i.setProperty("SystemCreationClassName", text("ZANKOR_ComputerSystem"));
-    i.setProperty("SystemName", text("server.example"));
-    i.setProperty("OwningEntity", text("ZAN"));
-    i.setProperty("ProviderName", text("SELProvider"));
-    i.setProperty("UniqueSystemID",
-                  text("00000000-0000-0000-0000-000000000000"));
-    return i;
+    CVLog::CVLogger::setSink(nullptr);
+    auto source = std::make_shared<QX::MemorySource>(treeWithWatchdog());
+    QX::Platform::overrideSource(source);
+    std::vector<host::Instance> delivered;
+    {
+        host::Host host(SELPROV_LIBRARY);
+        host::IndicationInbox inbox = host.listen(nameSpace);
+        for (const std::string& className : indicationClassNames())
+        {
+            host.activateFilter(host::IndicationFilter::forClass(className),
+                                true);
+        }
+        host.enableIndications();
+        for (const QX::SimulatedAlert alert :
+             {QX::SimulatedAlert::RecordAdded, QX::SimulatedAlert::LogCleared,
+              QX::SimulatedAlert::LogAlmostFull, QX::SimulatedAlert::LogFull,
+              QX::SimulatedAlert::WatchdogRestart})
+        {
+            source->raiseSimulatedAlert(alert);
+            const auto indication = inbox.next(patience);
+            if (!indication)
+            {
+                throw std::runtime_error(
+                    std::string("no indication for the simulated alert \"") +
+                    QX::simulatedAlertName(alert) + "\"");
+            }
+            delivered.push_back(indication->instance);
+        }
+        host.disableIndications();
+    }
+    QX::Platform::overrideSource(nullptr);
+    return delivered;
 }
 
 } // namespace
 
-std::vector<host::Instance> expectedIndications()
+const std::vector<host::Instance>& expectedIndications()
 {
-    const std::string restartEvent = "ZANx_AutomaticServerRestartEvent";
-    return {
-        indication("ZAN_MgmtHwLogEntryEvent", entryPath()),
-        indication("ZAN_MgmtHwLogClearEvent", logPath()),
-        indication("ZAN_MgmtHwLogFullEvent", logPath()),
-        // The restart event names its own class.
-        indication(restartEvent, pathOf(restartEvent).toString()),
-    };
+    static const std::vector<host::Instance> delivered = deliverOneOfEach();
+    return delivered;
 }
 
 } // namespace deploy
