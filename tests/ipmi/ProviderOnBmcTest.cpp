@@ -222,7 +222,9 @@ class BmcFaultTest : public BmcTest
 {
   protected:
     static constexpr unsigned timeoutMs = 1500;
-    static constexpr unsigned records = 2000;
+    // Large enough that reading it takes about a second on an idle
+    // machine, so the fault lands in the middle of the walk.
+    static constexpr unsigned records = 8000;
 
     void SetUp() override
     {
