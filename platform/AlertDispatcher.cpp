@@ -182,6 +182,12 @@ std::size_t AlertDispatcher::count(NodeLexicon::NodeType kind) const
         { return registration.kind == kind; }));
 }
 
+std::size_t AlertDispatcher::total() const
+{
+    const std::lock_guard lock(state_->mutex);
+    return state_->registrations.size();
+}
+
 void AlertDispatcher::post(std::vector<PendingAlert> alerts)
 {
     {

@@ -55,6 +55,8 @@ class AlertDispatcher
     void remove(NodeLexicon::NodeType kind, MonitorCallback callback,
                 const void* context);
     std::size_t count(NodeLexicon::NodeType kind) const;
+    /** Registrations of every kind. */
+    std::size_t total() const;
 
     /** Queues the alerts that some registration wants; drops the others. */
     void post(std::vector<PendingAlert> alerts);

@@ -8,7 +8,7 @@ set -euo pipefail
 packages=(cmake ninja-build g++ pkg-config googletest libgtest-dev
           libgmock-dev libbenchmark-dev clang-format
           dpkg-dev file lintian
-          libfreeipmi-dev freeipmi-tools openipmi ipmitool
+          libfreeipmi-dev freeipmi-tools openipmi ipmitool libopenipmi-dev
           clang-14 libclang-rt-14-dev)
 
 missing=()

@@ -74,6 +74,12 @@ class BmcCommands
     virtual std::uint64_t sessionGeneration() const = 0;
     /** When the last exchange ended (or the last session was opened). */
     virtual std::chrono::steady_clock::time_point lastActivity() const = 0;
+    /** IPMI requests sent so far (commands that open a session not
+     *  counted); any thread may read it. 0 when not counted. */
+    virtual std::uint64_t requestCount() const
+    {
+        return 0;
+    }
 };
 
 } // namespace QX::Ipmi

@@ -77,6 +77,11 @@ std::string IpmiSession::peerName() const
            driverName(context_ ? context_->driver() : parameters_.driver) + ")";
 }
 
+std::uint64_t IpmiSession::requestCount() const
+{
+    return requests_.load(std::memory_order_relaxed);
+}
+
 std::string IpmiSession::peerKey() const
 {
     if (!parameters_.lan)
@@ -213,6 +218,7 @@ template <typename Result, typename Work>
 Result IpmiSession::exchange(Work work)
 {
     const std::shared_ptr<IpmiContext> context = open();
+    requests_.fetch_add(1, std::memory_order_relaxed);
     try
     {
         if (guarded_)

@@ -32,8 +32,8 @@ namespace QX::Ipmi
  * returns, further exchanges fail at once (Busy); afterwards a new context
  * is opened.
  *
- * Not thread-safe: callers serialize every member except lastActivity()
- * and sessionGeneration(), which any thread may read.
+ * Not thread-safe: callers serialize every member except lastActivity(),
+ * sessionGeneration() and requestCount(), which any thread may read.
  */
 class IpmiSession : public BmcCommands
 {
@@ -52,6 +52,7 @@ class IpmiSession : public BmcCommands
     std::optional<std::uint8_t> getSystemRestartCause() override;
     std::uint64_t sessionGeneration() const override;
     std::chrono::steady_clock::time_point lastActivity() const override;
+    std::uint64_t requestCount() const override;
 
     /**
      * Runs @p work with the open context, as one exchange: the session is
@@ -83,6 +84,7 @@ class IpmiSession : public BmcCommands
     std::shared_ptr<PendingCall> abandoned_; // still inside the driver
     bool lost_ = false; // the last session ended in a failure
     std::atomic<std::uint64_t> generation_{0};
+    std::atomic<std::uint64_t> requests_{0};    // exchanges sent
     std::atomic<std::int64_t> lastActivity_{0}; // steady clock, ns
 };
 

@@ -228,6 +228,10 @@ std::string applySetting(Settings& settings, const std::string& key,
     {
         return number(key, value, 1, 100, settings.warningFillPercent);
     }
+    else if (key == "ipmi.poll-interval")
+    {
+        return number(key, value, 50, 600000, settings.pollIntervalMs);
+    }
     else if (key == "ipmi.sel-clock")
     {
         if (value == "utc")

@@ -1,5 +1,6 @@
 #include "IpmiSource.h"
 
+#include "AlertState.h"
 #include "IpmiError.h"
 #include "IpmiLog.h"
 #include "SelRecordText.h"
@@ -40,21 +41,25 @@ void logFailure(const char* what, const std::exception& error)
 IpmiSource::IpmiSource(std::unique_ptr<BmcCommands> bmc,
                        std::unique_ptr<RecordDescriber> describer,
                        const Settings& settings,
-                       std::string controllerDescription) :
+                       std::string controllerDescription,
+                       std::string alertStateFile) :
     bmc_(std::move(bmc)),
     describer_(std::move(describer)), settings_(settings),
     controllerDescription_(std::move(controllerDescription)),
     gate_(std::chrono::milliseconds(settings.timeoutMs),
-          [bmc = bmc_.get()] { return bmc->lastActivity(); })
+          [bmc = bmc_.get()] { return bmc->lastActivity(); }),
+    alertStateFile_(std::move(alertStateFile))
 {
     // The password is not needed beyond the session.
     settings_.password.clear();
     rebuildEntries();
 }
 
-// The describer may refer to the session: it goes first.
+// The poller uses everything else; the describer may refer to the
+// session.
 IpmiSource::~IpmiSource()
 {
+    stopPoller(true);
     describer_.reset();
 }
 
@@ -331,33 +336,152 @@ std::string IpmiSource::printablePath(const std::string& path) const
 void IpmiSource::startMonitoring(NodeLexicon::NodeType kind,
                                  MonitorCallback callback, const void* context)
 {
-    const std::lock_guard lock(monitorMutex_);
-    monitors_.push_back(Monitor{kind, callback, context});
+    dispatcher_.add(kind, callback, context);
+    const std::lock_guard lock(pollerMutex_);
+    if (!poller_.joinable() && dispatcher_.total() > 0)
+    {
+        poller_ = std::jthread([this](std::stop_token stop)
+                               { pollLoop(std::move(stop)); });
+    }
 }
 
 void IpmiSource::stopMonitoring(NodeLexicon::NodeType kind,
                                 MonitorCallback callback, const void* context)
 {
-    const std::lock_guard lock(monitorMutex_);
-    const auto found = std::find_if(monitors_.begin(), monitors_.end(),
-                                    [&](const Monitor& monitor)
-                                    {
-                                        return monitor.kind == kind &&
-                                               monitor.callback == callback &&
-                                               monitor.context == context;
-                                    });
-    if (found != monitors_.end())
+    // Not under the poller lock: this waits for a running callback, which
+    // may itself start or stop monitoring.
+    dispatcher_.remove(kind, callback, context);
+    if (dispatcher_.total() == 0)
     {
-        monitors_.erase(found);
+        stopPoller(false);
     }
+}
+
+void IpmiSource::stopPoller(bool evenIfMonitored)
+{
+    const std::lock_guard lock(pollerMutex_);
+    if (!poller_.joinable() || (!evenIfMonitored && dispatcher_.total() > 0))
+    {
+        return;
+    }
+    poller_.request_stop();
+    if (poller_.get_id() == std::this_thread::get_id())
+    {
+        poller_.detach(); // cannot happen: callbacks run elsewhere
+        return;
+    }
+    // A poll in progress ends within the BMC timeout.
+    poller_.join();
+}
+
+void IpmiSource::pollLoop(std::stop_token stop)
+{
+    const auto interval = std::chrono::milliseconds(settings_.pollIntervalMs);
+    while (!stop.stop_requested())
+    {
+        pollOnce();
+        std::unique_lock lock(waitMutex_);
+        wake_.wait_for(lock, stop, interval, [] { return false; });
+    }
+}
+
+void IpmiSource::pollOnce()
+{
+    TrackerResult result;
+    try
+    {
+        {
+            const BmcGate::Access access(gate_);
+            refreshTree();
+            SelObservation now;
+            now.records = &cache_.records();
+            now.info = cache_.info();
+            now.logStatus = logState_ ? logState_->status : nodeStatusOk;
+            now.restartCause = restartCause_;
+            if (tracker_.started())
+            {
+                result = tracker_.observe(now);
+            }
+            else
+            {
+                std::optional<AnnouncedState> kept;
+                if (!alertStateFile_.empty())
+                {
+                    std::string problem;
+                    kept = readAlertState(alertStateFile_, problem);
+                    if (!kept)
+                    {
+                        logLine(logLevelInfo, "IpmiSource", __LINE__,
+                                "No alert state in " + alertStateFile_ + " (" +
+                                    problem +
+                                    "): SEL records present now are not "
+                                    "announced");
+                    }
+                }
+                result = tracker_.start(kept, now);
+            }
+        }
+        if (failing_)
+        {
+            logLine(logLevelInfo, "IpmiSource", __LINE__,
+                    "SEL monitoring reaches the BMC again");
+            failing_ = false;
+        }
+    }
+    catch (const std::exception& error)
+    {
+        // Logged once per outage; the next interval tries again.
+        if (!failing_)
+        {
+            logFailure("SEL monitoring", error);
+            failing_ = true;
+        }
+        polls_.fetch_add(1, std::memory_order_release);
+        return;
+    }
+    if (!result.note.empty())
+    {
+        logLine(logLevelInfo, "IpmiSource", __LINE__, result.note);
+    }
+    dispatcher_.post(std::move(result.alerts));
+    if (result.stateChanged && !alertStateFile_.empty())
+    {
+        try
+        {
+            writeAlertState(alertStateFile_, tracker_.state());
+        }
+        catch (const std::exception& error)
+        {
+            logFailure("Keeping the alert state", error);
+        }
+    }
+    polls_.fetch_add(1, std::memory_order_release);
 }
 
 std::size_t IpmiSource::monitorCount(NodeLexicon::NodeType kind) const
 {
-    const std::lock_guard lock(monitorMutex_);
-    return static_cast<std::size_t>(
-        std::count_if(monitors_.begin(), monitors_.end(),
-                      [kind](const Monitor& m) { return m.kind == kind; }));
+    return dispatcher_.count(kind);
+}
+
+bool IpmiSource::polling() const
+{
+    const std::lock_guard lock(pollerMutex_);
+    return poller_.joinable();
+}
+
+std::uint64_t IpmiSource::pollCount() const
+{
+    return polls_.load(std::memory_order_acquire);
+}
+
+std::uint64_t IpmiSource::requestCount() const
+{
+    return bmc_->requestCount();
+}
+
+bool IpmiSource::waitForAlerts(std::chrono::milliseconds timeout) const
+{
+    return dispatcher_.waitIdle(timeout);
 }
 
 } // namespace QX::Ipmi

@@ -1,17 +1,23 @@
 #pragma once
 
+#include "AlertDispatcher.h"
 #include "BmcCommands.h"
 #include "BmcGate.h"
 #include "InstrumentationSource.h"
 #include "IpmiSettings.h"
 #include "NodeTree.h"
 #include "RecordDescriber.h"
+#include "SelAlertTracker.h"
 #include "SelCache.h"
 
+#include <atomic>
+#include <condition_variable>
 #include <memory>
 #include <mutex>
 #include <optional>
+#include <stop_token>
 #include <string>
+#include <thread>
 #include <vector>
 
 namespace QX::Ipmi
@@ -33,7 +39,19 @@ namespace QX::Ipmi
  * The SEL copy and the session are meant to be shared by everything in
  * the process that reads the BMC, alert polling included.
  *
- * Monitoring registrations are kept, but no alerts are raised yet.
+ * Monitoring: the first registration starts one poller thread, the last
+ * one removed stops and joins it (so does the destructor). Every poll
+ * interval the poller refreshes the shared SEL copy (one Get SEL Info
+ * while nothing changes) and SelAlertTracker turns the differences into
+ * alerts: code 2 on the entry node of each new record, in SEL order;
+ * code 0 on the log node for a clear and for each fill transition
+ * (status 21, 24); code 1 on the watchdog node for a watchdog-restart
+ * record, or at the first poll when the restart cause says watchdog and
+ * that restart was not announced yet. Callbacks run on the dispatcher's
+ * thread, so a slow or throwing one does not hold up polling. What was
+ * announced is kept in the alert state file (written atomically) so that
+ * a restarted process announces what happened meanwhile, once. BMC
+ * failures are logged once per outage; the poller keeps trying.
  */
 class IpmiSource : public InstrumentationSource
 {
@@ -50,10 +68,13 @@ class IpmiSource : public InstrumentationSource
      * @param describer event texts; may refer to @p bmc (destroyed first)
      * @param settings SEL clock, capacity, warning fill, wrapping, timeout
      * @param controllerDescription description of the controller node
+     * @param alertStateFile where monitoring keeps what it announced;
+     *        empty: nothing is kept across processes
      */
     IpmiSource(std::unique_ptr<BmcCommands> bmc,
                std::unique_ptr<RecordDescriber> describer,
-               const Settings& settings, std::string controllerDescription);
+               const Settings& settings, std::string controllerDescription,
+               std::string alertStateFile = {});
     ~IpmiSource() override;
 
     std::shared_ptr<const NodeTree> snapshot() override;
@@ -68,6 +89,15 @@ class IpmiSource : public InstrumentationSource
 
     /** Number of monitoring registrations for @p kind. */
     std::size_t monitorCount(NodeLexicon::NodeType kind) const;
+    /** Whether the poller thread runs. */
+    bool polling() const;
+    /** Polls completed (successful or not) since the source was made. */
+    std::uint64_t pollCount() const;
+    /** IPMI requests sent to the BMC so far. */
+    std::uint64_t requestCount() const;
+    /** Waits until every alert raised so far has been handed to the
+     *  callbacks; false when @p timeout ran out first. */
+    bool waitForAlerts(std::chrono::milliseconds timeout) const;
 
     /** Path of the entry node of a record: the log path, "/entry-" and the
      *  id in five digits; records after the n-th restart of the ids get
@@ -84,13 +114,6 @@ class IpmiSource : public InstrumentationSource
         unsigned status = 0;
         bool operator==(const LogState&) const = default;
     };
-    struct Monitor
-    {
-        NodeLexicon::NodeType kind;
-        MonitorCallback callback;
-        const void* context;
-    };
-
     std::shared_ptr<const NodeTree> refreshTree();
     void rebuildEntries();
     void addEntry(const CachedRecord& record);
@@ -99,6 +122,9 @@ class IpmiSource : public InstrumentationSource
     void refreshRestartCause(bool selChanged);
     void applyRestartCause();
     void clearSel();
+    void pollLoop(std::stop_token stop);
+    void pollOnce();
+    void stopPoller(bool evenIfMonitored);
 
     // Declared before the describer, which may refer to it.
     std::unique_ptr<BmcCommands> bmc_;
@@ -116,8 +142,17 @@ class IpmiSource : public InstrumentationSource
     std::optional<std::uint8_t> restartCause_;
     std::optional<std::uint64_t> restartCauseGeneration_;
 
-    mutable std::mutex monitorMutex_;
-    std::vector<Monitor> monitors_;
+    // Used by the poller thread only (one at a time).
+    SelAlertTracker tracker_;
+    std::string alertStateFile_;
+    bool failing_ = false;
+
+    AlertDispatcher dispatcher_;
+    std::atomic<std::uint64_t> polls_{0};
+    mutable std::mutex pollerMutex_; // starting and stopping the poller
+    std::mutex waitMutex_;           // the poller's wait between polls
+    std::condition_variable_any wake_;
+    std::jthread poller_; // last: stopped before the rest goes
 };
 
 } // namespace QX::Ipmi

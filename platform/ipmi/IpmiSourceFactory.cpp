@@ -114,9 +114,13 @@ makeIpmiSource(Settings settings, const std::string& configurationFile)
         auto describer = std::make_unique<FreeIpmiDescriber>(
             *session, settings.stateDirectory, flags.sdrCreate, flags.sel);
         const std::string peer = session->peerName();
+        const std::string alertState =
+            settings.stateDirectory.empty()
+                ? std::string()
+                : settings.stateDirectory + "/sel-alerts-" + session->peerKey();
         auto source = std::make_shared<IpmiSource>(
             std::move(session), std::move(describer), settings,
-            "Baseboard Management Controller, " + peer);
+            "Baseboard Management Controller, " + peer, alertState);
         logLine(logLevelInfo, "makeIpmiSource", __LINE__,
                 "IPMI instrumentation: " + peer + ", privilege " +
                     settings.privilege + ", timeout " +

@@ -23,9 +23,7 @@ void BmcTest::SetUp()
 
 void BmcTest::TearDown()
 {
-    host_.reset();
-    QX::Platform::overrideSource(nullptr);
-    source.reset();
+    stopProvider();
     bmc_.reset();
 }
 
@@ -41,6 +39,7 @@ QX::Ipmi::Settings BmcTest::settings(unsigned timeoutMs) const
     settings.timeoutMs = timeoutMs;
     settings.retransmissionTimeoutMs = 250;
     settings.stateDirectory = bmc_->directory() + "/platform-state";
+    settings.pollIntervalMs = pollIntervalMs;
     return settings;
 }
 
@@ -48,6 +47,21 @@ void BmcTest::start(bmcsim::Options options, unsigned timeoutMs)
 {
     bmc_ = std::make_unique<bmcsim::SimulatedBmc>(std::move(options));
     bmc_->start();
+    startProvider(timeoutMs);
+}
+
+void BmcTest::stopProvider()
+{
+    // The host disables indications before it unloads the provider, which
+    // ends the monitoring; then the source goes, as the platform library
+    // does after the provider's.
+    host_.reset();
+    QX::Platform::overrideSource(nullptr);
+    source.reset();
+}
+
+void BmcTest::startProvider(unsigned timeoutMs)
+{
     source = QX::Ipmi::makeIpmiSource(settings(timeoutMs), "");
     QX::Platform::overrideSource(source);
     host_ = std::make_unique<host::Host>(SELPROV_LIBRARY);

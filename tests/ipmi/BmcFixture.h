@@ -33,6 +33,12 @@ class BmcTest : public ::testing::Test
 
     /** Starts the simulator, then the IPMI source and the provider. */
     void start(bmcsim::Options options, unsigned timeoutMs = 2000);
+    /** Unloads the provider and ends the IPMI source, as when the object
+     *  manager stops; the simulator keeps running. */
+    void stopProvider();
+    /** A new IPMI source (same state directory) and the provider loaded
+     *  again, as when the object manager starts again. */
+    void startProvider(unsigned timeoutMs = 2000);
     /** The settings the source is made with (LAN 2.0 to the simulator). */
     QX::Ipmi::Settings settings(unsigned timeoutMs) const;
 
@@ -54,6 +60,8 @@ class BmcTest : public ::testing::Test
     unsigned ipmitoolEntries() const;
 
     std::shared_ptr<QX::InstrumentationSource> source;
+    /** How often the source's monitoring polls the simulator. */
+    unsigned pollIntervalMs = 5000;
 
   private:
     std::unique_ptr<bmcsim::SimulatedBmc> bmc_;

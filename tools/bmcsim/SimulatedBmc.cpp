@@ -17,6 +17,7 @@
 #include <spawn.h>
 #include <sstream>
 #include <stdexcept>
+#include <string_view>
 #include <sys/socket.h>
 #include <sys/wait.h>
 #include <thread>
@@ -264,7 +265,7 @@ void SimulatedBmc::writeFiles(bool seedSel) const
                   options_.user + "\" \"" + options_.password +
                   "\" admin 10 none md2 md5 straight\n"
                   "console 127.0.0.1 " +
-                  std::to_string(consolePort_) + "\n");
+                  std::to_string(consolePort_) + "\n" + moduleLine());
 
     std::string emulator = "mc_setbmc 0x20\n"
                            "mc_add 0x20 0 no-device-sdrs 0x23 9 8 0x9f 0x1291 "
@@ -461,6 +462,31 @@ void SimulatedBmc::release()
     released_ = true;
 }
 
+bool SimulatedBmc::moduleAvailable()
+{
+    return std::string_view(BMCSIM_RESTART_MODULE).size() > 0 &&
+           fs::exists(BMCSIM_RESTART_MODULE);
+}
+
+std::string SimulatedBmc::moduleLine() const
+{
+    if (!options_.restartModule || !moduleAvailable())
+    {
+        return {};
+    }
+    return std::string("loadlib \"") + BMCSIM_RESTART_MODULE + "\" \"\"\n";
+}
+
+void SimulatedBmc::clearSel()
+{
+    clearSelAt(host(), options_.user, options_.password);
+}
+
+void SimulatedBmc::startWatchdog(WatchdogAction action, unsigned tenths)
+{
+    startWatchdogAt(host(), options_.user, options_.password, action, tenths);
+}
+
 void SimulatedBmc::setSelTime(std::uint32_t secondsSinceEpoch)
 {
     QX::Ipmi::IpmiContext context(sessionTo(*this, 2000));
@@ -508,6 +534,67 @@ std::vector<std::uint16_t> addRecordsAt(const std::string& host,
             static_cast<std::uint16_t>(response[2] | response[3] << 8));
     }
     return ids;
+}
+
+namespace
+{
+
+// Sends one raw request; throws unless the BMC answers with success.
+std::vector<std::uint8_t> rawCommand(QX::Ipmi::IpmiContext& context,
+                                     std::uint8_t netFn,
+                                     std::vector<std::uint8_t> request,
+                                     const char* what)
+{
+    std::uint8_t response[64] = {};
+    const int length = ipmi_cmd_raw(context.get(), 0, netFn, request.data(),
+                                    static_cast<unsigned>(request.size()),
+                                    response, sizeof response);
+    if (length < 0)
+    {
+        context.fail(what);
+    }
+    if (length < 2 || response[1] != 0)
+    {
+        char code[8];
+        std::snprintf(code, sizeof code, "%02Xh",
+                      length >= 2 ? response[1] : 0xFF);
+        throw std::runtime_error(std::string(what) +
+                                 " failed with completion code " + code);
+    }
+    return std::vector<std::uint8_t>(response, response + length);
+}
+
+} // namespace
+
+void clearSelAt(const std::string& host, const std::string& user,
+                const std::string& password)
+{
+    QX::Ipmi::IpmiContext context(sessionTo(host, user, password, 2000));
+    const auto reserved =
+        rawCommand(context, IPMI_NET_FN_STORAGE_RQ, {0x42}, "Reserve SEL");
+    if (reserved.size() < 4)
+    {
+        throw std::runtime_error("Reserve SEL gave a short answer");
+    }
+    // Clear SEL: reservation, "CLR", initiate erase.
+    rawCommand(context, IPMI_NET_FN_STORAGE_RQ,
+               {0x47, reserved[2], reserved[3], 'C', 'L', 'R', 0xAA},
+               "Clear SEL");
+}
+
+void startWatchdogAt(const std::string& host, const std::string& user,
+                     const std::string& password, WatchdogAction action,
+                     unsigned tenths)
+{
+    QX::Ipmi::IpmiContext context(sessionTo(host, user, password, 2000));
+    // Set Watchdog Timer: use SMS/OS (04h), the action, no pre-timeout,
+    // clear the SMS/OS expiration flag, the countdown in 100 ms.
+    rawCommand(context, IPMI_NET_FN_APP_RQ,
+               {0x24, 0x04, static_cast<std::uint8_t>(action), 0x00, 0x10,
+                static_cast<std::uint8_t>(tenths & 0xFF),
+                static_cast<std::uint8_t>(tenths >> 8)},
+               "Set Watchdog Timer");
+    rawCommand(context, IPMI_NET_FN_APP_RQ, {0x22}, "Reset Watchdog Timer");
 }
 
 std::vector<Record> generatedRecords(unsigned count, std::uint16_t firstId,

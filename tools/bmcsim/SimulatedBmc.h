@@ -41,6 +41,17 @@ struct Options
     std::vector<Sensor> sensors;
     std::string user = "admin";
     std::string password = "password";
+    /** Load the project's simulator module (restart cause, watchdog
+     *  actions) when it was built. */
+    bool restartModule = true;
+};
+
+/** Watchdog actions of Set Watchdog Timer. */
+enum class WatchdogAction : std::uint8_t
+{
+    HardReset = 1,
+    PowerDown = 2,
+    PowerCycle = 3,
 };
 
 /**
@@ -61,6 +72,8 @@ class SimulatedBmc
 
     /** Whether an ipmi_sim executable is on the PATH. */
     static bool available();
+    /** Whether the simulator module was built (restart cause, watchdog). */
+    static bool moduleAvailable();
 
     void start();
     /** SIGTERM, up to 5 s to exit, then SIGKILL. */
@@ -77,6 +90,12 @@ class SimulatedBmc
     /** Adds records over IPMI (Add SEL Entry); returns their ids. */
     std::vector<std::uint16_t> addRecords(const std::vector<Record>& records);
     void setSelTime(std::uint32_t secondsSinceEpoch);
+    /** Clears the SEL over IPMI (Clear SEL). */
+    void clearSel();
+    /** Sets the watchdog (SMS/OS use) to @p action after @p tenths of a
+     *  second and starts it; it expires by itself, logs a Watchdog 2
+     *  record and (with the module) sets the restart cause to watchdog. */
+    void startWatchdog(WatchdogAction action, unsigned tenths);
 
     pid_t pid() const
     {
@@ -101,6 +120,7 @@ class SimulatedBmc
 
   private:
     void writeFiles(bool seedSel) const;
+    std::string moduleLine() const;
     void launch();
     void waitUntilAnswering();
     bool reap(int waitMs);
@@ -120,6 +140,16 @@ std::vector<std::uint16_t> addRecordsAt(const std::string& host,
                                         const std::string& user,
                                         const std::string& password,
                                         const std::vector<Record>& records);
+
+/** Clears the SEL of the simulator at @p host. */
+void clearSelAt(const std::string& host, const std::string& user,
+                const std::string& password);
+
+/** Starts the watchdog of the simulator at @p host (see
+ *  SimulatedBmc::startWatchdog). */
+void startWatchdogAt(const std::string& host, const std::string& user,
+                     const std::string& password, WatchdogAction action,
+                     unsigned tenths);
 
 /** @p count system event records with ids from @p firstId and times
  *  ending at @p lastTime, cycling through a few sensor events. */

@@ -7,6 +7,10 @@
 //       configuration in DIR and prints "host=127.0.0.1:PORT" and
 //       "pid=PID"; the simulator keeps running
 //   bmcsim add --dir DIR --count N     adds N records over IPMI
+//   bmcsim clear --dir DIR             clears the SEL over IPMI
+//   bmcsim watchdog --dir DIR [--tenths N]
+//       starts the watchdog with action hard reset; it expires after N
+//       tenths of a second (default 10) and logs a Watchdog 2 record
 //   bmcsim stop --dir DIR              stops the simulator started in DIR
 #include "SimulatedBmc.h"
 
@@ -28,6 +32,8 @@ constexpr const char* usage =
     "usage: bmcsim start --dir DIR [--max-records N] [--no-sel-time]\n"
     "                    [--fixture FILE | --sample | --generate N]\n"
     "       bmcsim add --dir DIR --count N\n"
+    "       bmcsim clear --dir DIR\n"
+    "       bmcsim watchdog --dir DIR [--tenths N]\n"
     "       bmcsim stop --dir DIR\n";
 
 struct UsageError : std::runtime_error
@@ -149,6 +155,22 @@ int main(int argc, char** argv)
                 bmcsim::generatedRecords(
                     number(options["--count"]), 1,
                     static_cast<std::uint32_t>(std::time(nullptr))));
+            return 0;
+        }
+        if (command == "clear")
+        {
+            const bmcsim::Options defaults;
+            bmcsim::clearSelAt(readLine(dir + "/bmcsim.host"), defaults.user,
+                               defaults.password);
+            return 0;
+        }
+        if (command == "watchdog")
+        {
+            const bmcsim::Options defaults;
+            bmcsim::startWatchdogAt(
+                readLine(dir + "/bmcsim.host"), defaults.user,
+                defaults.password, bmcsim::WatchdogAction::HardReset,
+                options.count("--tenths") ? number(options["--tenths"]) : 10);
             return 0;
         }
         if (command != "start")

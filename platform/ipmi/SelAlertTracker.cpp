@@ -1,0 +1,227 @@
+#include "SelAlertTracker.h"
+
+#include "IpmiSource.h"
+#include "NodeLexicon.h"
+#include "SelRecordText.h"
+
+#include <algorithm>
+
+namespace QX::Ipmi
+{
+
+namespace
+{
+
+using namespace NodeLexicon;
+
+constexpr std::uint8_t systemEventRecord = 0x02;
+constexpr std::uint8_t sensorTypeWatchdog2 = 0x23;
+constexpr std::uint8_t sensorSpecificReading = 0x6f;
+// Watchdog 2 offsets: 1 hard reset, 2 power down, 3 power cycle.
+constexpr std::uint8_t firstRestartOffset = 1;
+constexpr std::uint8_t lastRestartOffset = 3;
+// Restart key when the BMC reports a watchdog restart without a record.
+constexpr const char* restartWithoutRecord = "cause-only";
+
+PendingAlert alert(NodeType kind, unsigned code, std::string path)
+{
+    return PendingAlert{kind, code, DateTime::now(), std::move(path)};
+}
+
+std::string compactHex(const SelRecordBytes& record)
+{
+    std::string text;
+    char pair[3];
+    for (const std::uint8_t byte : record)
+    {
+        std::snprintf(pair, sizeof pair, "%02x", byte);
+        text += pair;
+    }
+    return text;
+}
+
+bool isFillStatus(unsigned status)
+{
+    return status == EventLogStatusAlmostFull || status == EventLogStatusFull;
+}
+
+} // namespace
+
+bool SelAlertTracker::isWatchdogRestart(const SelRecordBytes& record)
+{
+    const bool asserted = (record[12] & 0x80) == 0;
+    const std::uint8_t offset = record[13] & 0x0F;
+    return record[2] == systemEventRecord &&
+           record[10] == sensorTypeWatchdog2 &&
+           (record[12] & 0x7F) == sensorSpecificReading && asserted &&
+           offset >= firstRestartOffset && offset <= lastRestartOffset;
+}
+
+std::string
+SelAlertTracker::restartKeyOf(const std::vector<CachedRecord>& records)
+{
+    const auto newest = std::find_if(records.rbegin(), records.rend(),
+                                     [](const CachedRecord& record) {
+                                         return isWatchdogRestart(record.bytes);
+                                     });
+    return newest == records.rend() ? restartWithoutRecord
+                                    : compactHex(newest->bytes);
+}
+
+TrackerResult SelAlertTracker::start(const std::optional<AnnouncedState>& kept,
+                                     const SelObservation& now)
+{
+    const std::vector<CachedRecord>& records = *now.records;
+    TrackerResult result;
+    started_ = true;
+    lastInfo_ = now.info;
+    known_.clear();
+
+    if (!kept)
+    {
+        // Nothing known of earlier runs: what is there now is old.
+        for (const CachedRecord& record : records)
+        {
+            known_.insert(record.bytes);
+        }
+        state_ = AnnouncedState{};
+        state_.logStatus = now.logStatus;
+        state_.restartKey = now.restartCause == restartCauseWatchdog
+                                ? restartKeyOf(records)
+                                : std::string();
+        remember(now);
+        result.stateChanged = true;
+        return result;
+    }
+
+    state_ = *kept;
+    if (kept->lastErase != now.info.mostRecentErase)
+    {
+        // Cleared meanwhile: one clear, and every record is newer.
+        result.alerts.push_back(
+            alert(EventLog, AlertOnEventLog, IpmiSource::logPath));
+    }
+    else if (kept->lastRecord)
+    {
+        const auto found =
+            std::find_if(records.begin(), records.end(),
+                         [&](const CachedRecord& record)
+                         { return record.bytes == *kept->lastRecord; });
+        if (found == records.end())
+        {
+            result.note = "the last record announced before is no longer in "
+                          "the SEL: records added meanwhile are not announced";
+        }
+        const auto knownEnd =
+            found == records.end() ? records.end() : found + 1;
+        for (auto it = records.begin(); it != knownEnd; ++it)
+        {
+            known_.insert(it->bytes);
+        }
+    }
+    else if (kept->lastAddition == now.info.mostRecentAddition)
+    {
+        // The SEL was empty and nothing was added since.
+        for (const CachedRecord& record : records)
+        {
+            known_.insert(record.bytes);
+        }
+    }
+    announceNew(now, result.alerts);
+
+    if (now.logStatus != kept->logStatus && isFillStatus(now.logStatus))
+    {
+        result.alerts.push_back(
+            alert(EventLog, AlertOnEventLog, IpmiSource::logPath));
+    }
+    if (now.restartCause == restartCauseWatchdog)
+    {
+        // Without a watchdog record to tell restarts apart, only the
+        // first one is announced.
+        const std::string key = restartKeyOf(records);
+        const bool recorded = key != restartWithoutRecord;
+        if (key != state_.restartKey && (recorded || state_.restartKey.empty()))
+        {
+            result.alerts.push_back(
+                alert(Watchdog, AlertOnWatchdog, IpmiSource::watchdogPath));
+            state_.restartKey = key;
+        }
+    }
+    state_.logStatus = now.logStatus;
+    remember(now);
+    result.stateChanged = state_ != *kept;
+    return result;
+}
+
+TrackerResult SelAlertTracker::observe(const SelObservation& now)
+{
+    TrackerResult result;
+    if (now.info.sameRecordsAs(lastInfo_) &&
+        now.logStatus == state_.logStatus &&
+        now.records->size() == known_.size())
+    {
+        lastInfo_ = now.info;
+        return result;
+    }
+    const AnnouncedState before = state_;
+    if (now.info.mostRecentErase != lastInfo_.mostRecentErase)
+    {
+        result.alerts.push_back(
+            alert(EventLog, AlertOnEventLog, IpmiSource::logPath));
+        known_.clear();
+    }
+    announceNew(now, result.alerts);
+    if (now.logStatus != state_.logStatus && isFillStatus(now.logStatus))
+    {
+        result.alerts.push_back(
+            alert(EventLog, AlertOnEventLog, IpmiSource::logPath));
+    }
+    state_.logStatus = now.logStatus;
+    lastInfo_ = now.info;
+    remember(now);
+    result.stateChanged = state_ != before;
+    return result;
+}
+
+void SelAlertTracker::announceNew(const SelObservation& now,
+                                  std::vector<PendingAlert>& out)
+{
+    for (const CachedRecord& record : *now.records)
+    {
+        if (known_.count(record.bytes) != 0)
+        {
+            continue;
+        }
+        out.push_back(alert(EventLogEntry, AlertOnEventLogEntry,
+                            IpmiSource::entryPath(record.run, record.id)));
+        if (isWatchdogRestart(record.bytes))
+        {
+            out.push_back(
+                alert(Watchdog, AlertOnWatchdog, IpmiSource::watchdogPath));
+            state_.restartKey = compactHex(record.bytes);
+        }
+    }
+}
+
+void SelAlertTracker::remember(const SelObservation& now)
+{
+    // Records that left the SEL (deleted, overwritten) are forgotten.
+    known_.clear();
+    for (const CachedRecord& record : *now.records)
+    {
+        known_.insert(record.bytes);
+    }
+    if (!now.records->empty())
+    {
+        state_.lastRecord = now.records->back().bytes;
+    }
+    else
+    {
+        state_.lastRecord.reset();
+    }
+    state_.lastAddition = now.info.mostRecentAddition;
+    state_.lastErase = now.info.mostRecentErase;
+    lastInfo_ = now.info;
+}
+
+} // namespace QX::Ipmi

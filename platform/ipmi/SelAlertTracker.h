@@ -1,0 +1,81 @@
+#pragma once
+
+#include "AlertDispatcher.h"
+#include "AlertState.h"
+#include "SelCache.h"
+
+#include <optional>
+#include <set>
+#include <string>
+#include <vector>
+
+namespace QX::Ipmi
+{
+
+/** What one look at the BMC found, as the tracker compares it. */
+struct SelObservation
+{
+    const std::vector<CachedRecord>* records = nullptr;
+    SelInfo info;
+    unsigned logStatus = 0;
+    std::optional<std::uint8_t> restartCause;
+};
+
+/** The alerts one comparison raises, and whether the state to keep
+ *  changed. */
+struct TrackerResult
+{
+    std::vector<PendingAlert> alerts;
+    bool stateChanged = false;
+    /** Something worth a log line, or empty. */
+    std::string note;
+};
+
+/**
+ * @brief Turns successive views of the SEL into alerts: each new record
+ *        once, a clear once, each fill transition once, each watchdog
+ *        restart once.
+ *
+ * start() takes the state kept from an earlier run (or nothing: then
+ * everything present counts as already announced) and announces what
+ * happened meanwhile; observe() compares each later view with the one
+ * before. Records are compared by their 16 bytes, which hold id and
+ * timestamp, because record ids start again after some BMC restarts.
+ * Not thread-safe.
+ */
+class SelAlertTracker
+{
+  public:
+    /** Restart cause "watchdog expired" (Get System Restart Cause). */
+    static constexpr std::uint8_t restartCauseWatchdog = 0x04;
+
+    /** Whether @p record reports a watchdog expiry that reset, powered
+     *  down or power-cycled the server (Watchdog 2 sensor, offsets 1-3,
+     *  asserted). */
+    static bool isWatchdogRestart(const SelRecordBytes& record);
+
+    TrackerResult start(const std::optional<AnnouncedState>& kept,
+                        const SelObservation& now);
+    TrackerResult observe(const SelObservation& now);
+
+    bool started() const
+    {
+        return started_;
+    }
+    const AnnouncedState& state() const
+    {
+        return state_;
+    }
+
+  private:
+    void announceNew(const SelObservation& now, std::vector<PendingAlert>& out);
+    void remember(const SelObservation& now);
+    static std::string restartKeyOf(const std::vector<CachedRecord>& records);
+
+    bool started_ = false;
+    AnnouncedState state_;
+    SelInfo lastInfo_;
+    std::set<SelRecordBytes> known_;
+};
+
+} // namespace QX::Ipmi

@@ -1,0 +1,395 @@
+// Indications caused by real IPMI traffic: the provider's indication MI,
+// loaded as an object manager loads it, on the IPMI source polling
+// OpenIPMI's simulated BMC.
+
+#include "BmcFixture.h"
+#include "IndicationInbox.h"
+#include "ipmi/IpmiSource.h"
+
+#include <chrono>
+#include <optional>
+#include <thread>
+
+#include <gmock/gmock.h>
+#include <gtest/gtest.h>
+
+namespace
+{
+
+using bmctest::number;
+using bmctest::text;
+using ::testing::HasSubstr;
+
+constexpr const char* entryEvent = "ZAN_MgmtHwLogEntryEvent";
+constexpr const char* clearEvent = "ZAN_MgmtHwLogClearEvent";
+constexpr const char* fullEvent = "ZAN_MgmtHwLogFullEvent";
+constexpr const char* restartEvent = "ZANx_AutomaticServerRestartEvent";
+
+// Short enough to keep the suite quick, long enough for the sanitizer
+// builds to keep up.
+constexpr unsigned pollMs = 150;
+// What a test waits for something the next polls should bring.
+constexpr std::chrono::seconds patience{10};
+// How long a test waits to see that nothing more arrives.
+constexpr std::chrono::milliseconds quietSpell{6 * pollMs};
+
+// A temperature event with id @p id and time @p time (the BMC sets both).
+bmcsim::Record temperatureRecord(std::uint16_t id, std::uint32_t time)
+{
+    return {static_cast<std::uint8_t>(id),
+            static_cast<std::uint8_t>(id >> 8),
+            0x02,
+            static_cast<std::uint8_t>(time),
+            static_cast<std::uint8_t>(time >> 8),
+            static_cast<std::uint8_t>(time >> 16),
+            static_cast<std::uint8_t>(time >> 24),
+            0x20,
+            0x00,
+            0x04,
+            0x01,
+            0x30,
+            0x01,
+            0x57,
+            static_cast<std::uint8_t>(0x40 + (id & 0x0F)),
+            0x50};
+}
+
+std::vector<bmcsim::Record> temperatureRecords(unsigned count)
+{
+    std::vector<bmcsim::Record> records;
+    for (unsigned i = 0; i < count; ++i)
+    {
+        records.push_back(temperatureRecord(static_cast<std::uint16_t>(i + 1),
+                                            0x65e58300 + i));
+    }
+    return records;
+}
+
+class AlertsOnBmcTest : public bmctest::BmcTest
+{
+  protected:
+    void launch(bmcsim::Options options, unsigned timeoutMs = 2000)
+    {
+        pollIntervalMs = pollMs;
+        start(std::move(options), timeoutMs);
+        listen();
+    }
+    void reload(unsigned timeoutMs = 2000)
+    {
+        inbox.reset();
+        stopProvider();
+        startProvider(timeoutMs);
+        listen();
+    }
+    void listen()
+    {
+        inbox = std::make_unique<host::IndicationInbox>(
+            host().listen("root/zanqx"));
+    }
+
+    QX::Ipmi::IpmiSource& ipmi()
+    {
+        auto* found = dynamic_cast<QX::Ipmi::IpmiSource*>(source.get());
+        if (found == nullptr)
+        {
+            throw std::logic_error("the source is not the IPMI source");
+        }
+        return *found;
+    }
+
+    /** Subscribes to @p className as an object manager does, enables
+     *  indications, and waits until the poller has looked at the BMC. */
+    void subscribe(const std::string& className)
+    {
+        const auto filter = host::IndicationFilter::forClass(className);
+        ASSERT_EQ(host().authorizeFilter(filter, "root").rc, CMPI_RC_OK);
+        ASSERT_EQ(host().mustPoll(filter).rc, CMPI_RC_OK);
+        ASSERT_EQ(host().activateFilter(filter, true).rc, CMPI_RC_OK);
+        ASSERT_EQ(host().enableIndications().rc, CMPI_RC_OK);
+        ASSERT_TRUE(ipmi().polling());
+        waitForPolls(1);
+    }
+
+    /** Waits until @p count more polls have been completed. */
+    void waitForPolls(unsigned count)
+    {
+        const std::uint64_t target = ipmi().pollCount() + count;
+        const auto deadline = std::chrono::steady_clock::now() + patience;
+        while (ipmi().pollCount() < target &&
+               std::chrono::steady_clock::now() < deadline)
+        {
+            std::this_thread::sleep_for(std::chrono::milliseconds(10));
+        }
+        ASSERT_GE(ipmi().pollCount(), target) << "the poller did not poll";
+    }
+
+    std::optional<host::DeliveredIndication> next()
+    {
+        return inbox->next(patience);
+    }
+    /** Whatever arrives within a few poll intervals. */
+    std::vector<host::DeliveredIndication> more()
+    {
+        std::this_thread::sleep_for(quietSpell);
+        ipmi().waitForAlerts(patience);
+        EXPECT_TRUE(host().broker().waitForThreads(patience));
+        return inbox->takeAll();
+    }
+
+    std::unique_ptr<host::IndicationInbox> inbox;
+};
+
+std::string recordIdKey(unsigned id)
+{
+    return "RecordID=\"" + std::to_string(id) + "\"";
+}
+
+TEST_F(AlertsOnBmcTest, AddedRecordDeliversItsEntryEvent)
+{
+    bmcsim::Options options;
+    options.records = temperatureRecords(2);
+    launch(options);
+    subscribe(entryEvent);
+
+    const auto ids = bmc().addRecords({temperatureRecord(0, 0)});
+    ASSERT_EQ(ids.size(), 1u);
+    const auto indication = next();
+    ASSERT_TRUE(indication.has_value()) << "no entry event";
+    EXPECT_EQ(indication->instance.path.className, entryEvent);
+    EXPECT_THAT(text(indication->instance, "AlertingManagedElement"),
+                HasSubstr(recordIdKey(ids[0])));
+
+    // The event names the record as the log entry instance does.
+    const auto entries = enumerate("ZAN_MgmtHwLogEntry");
+    ASSERT_EQ(entries.instances.size(), 3u);
+    const host::Instance& entry = entries.instances.back();
+    EXPECT_EQ(text(entry, "RecordID"), std::to_string(ids[0]));
+    EXPECT_EQ(text(indication->instance, "IndicationIdentifier"),
+              text(entry, "Description"));
+    EXPECT_FALSE(text(indication->instance, "IndicationIdentifier").empty());
+
+    EXPECT_TRUE(more().empty()) << "an event came twice";
+}
+
+TEST_F(AlertsOnBmcTest, TenRecordsAtOnceArriveInRecordOrder)
+{
+    launch({});
+    subscribe(entryEvent);
+
+    std::vector<bmcsim::Record> records(10, temperatureRecord(0, 0));
+    const auto ids = bmc().addRecords(records);
+    ASSERT_EQ(ids.size(), 10u);
+    for (const std::uint16_t id : ids)
+    {
+        const auto indication = next();
+        ASSERT_TRUE(indication.has_value()) << "no event for record " << id;
+        EXPECT_EQ(indication->instance.path.className, entryEvent);
+        EXPECT_THAT(text(indication->instance, "AlertingManagedElement"),
+                    HasSubstr(recordIdKey(id)));
+    }
+    EXPECT_TRUE(more().empty());
+}
+
+TEST_F(AlertsOnBmcTest, ClearDeliversOneClearEvent)
+{
+    bmcsim::Options options;
+    options.records = temperatureRecords(3);
+    launch(options);
+    subscribe(clearEvent);
+
+    bmc().clearSel();
+    const auto indication = next();
+    ASSERT_TRUE(indication.has_value()) << "no clear event";
+    EXPECT_EQ(indication->instance.path.className, clearEvent);
+    EXPECT_EQ(text(indication->instance, "IndicationIdentifier"),
+              "IMPI SEL Log");
+    EXPECT_TRUE(more().empty());
+}
+
+TEST_F(AlertsOnBmcTest, FillingDeliversWarningThenCriticalOnceEach)
+{
+    bmcsim::Options options;
+    options.maxRecords = 8; // warning at 75 %: 6 records; full at 8
+    options.records = temperatureRecords(4);
+    launch(options);
+    subscribe(fullEvent);
+
+    // One record per poll, so that every fill level is seen; the ninth is
+    // refused by the full SEL.
+    for (unsigned added = 0; added < 5; ++added)
+    {
+        try
+        {
+            bmc().addRecords({temperatureRecord(0, 0)});
+        }
+        catch (const std::runtime_error& error)
+        {
+            EXPECT_EQ(added, 4u) << error.what();
+        }
+        waitForPolls(2);
+        ipmi().waitForAlerts(patience);
+        host().broker().waitForThreads(patience);
+    }
+    const auto events = more();
+    ASSERT_EQ(events.size(), 2u);
+    EXPECT_EQ(events[0].instance.path.className, fullEvent);
+    EXPECT_THAT(text(events[0].instance, "EventID"), HasSubstr("Warning"));
+    EXPECT_EQ(number(events[0].instance, "PerceivedSeverity"), 3u);
+    EXPECT_EQ(events[1].instance.path.className, fullEvent);
+    EXPECT_THAT(text(events[1].instance, "EventID"), HasSubstr("Critical"));
+    EXPECT_EQ(number(events[1].instance, "PerceivedSeverity"), 6u);
+}
+
+TEST_F(AlertsOnBmcTest, WatchdogExpiryDeliversOneRestartEventAcrossRestarts)
+{
+    if (!bmcsim::SimulatedBmc::moduleAvailable())
+    {
+        GTEST_SKIP() << "the simulator module was not built "
+                        "(libopenipmi-dev missing)";
+    }
+    launch({});
+    subscribe(restartEvent);
+
+    bmc().startWatchdog(bmcsim::WatchdogAction::HardReset, 3);
+    const auto indication = next();
+    ASSERT_TRUE(indication.has_value()) << "no restart event";
+    EXPECT_EQ(indication->instance.path.className, restartEvent);
+    // Severity 4 is the watchdog cause; any other cause gives 2.
+    EXPECT_EQ(number(indication->instance, "PerceivedSeverity"), 4u);
+    EXPECT_TRUE(more().empty());
+
+    // The BMC still says "watchdog" after a restart of the object
+    // manager: that restart was announced already.
+    reload();
+    subscribe(restartEvent);
+    EXPECT_TRUE(more().empty());
+}
+
+TEST_F(AlertsOnBmcTest, RestartCauseWithoutRecordIsAnnouncedOnceAtStart)
+{
+    if (!bmcsim::SimulatedBmc::moduleAvailable())
+    {
+        GTEST_SKIP() << "the simulator module was not built "
+                        "(libopenipmi-dev missing)";
+    }
+    launch({});
+    subscribe(restartEvent);
+    EXPECT_TRUE(more().empty()); // cause "unknown"
+    reload();
+
+    // The watchdog restarts the server while the object manager is down,
+    // and the SEL is cleared before it comes back.
+    bmc().startWatchdog(bmcsim::WatchdogAction::PowerCycle, 2);
+    std::this_thread::sleep_for(std::chrono::milliseconds(800));
+    bmc().clearSel();
+    reload();
+    subscribe(restartEvent);
+    const auto indication = next();
+    ASSERT_TRUE(indication.has_value()) << "no restart event";
+    EXPECT_EQ(number(indication->instance, "PerceivedSeverity"), 4u);
+    EXPECT_TRUE(more().empty());
+
+    reload();
+    subscribe(restartEvent);
+    EXPECT_TRUE(more().empty());
+}
+
+TEST_F(AlertsOnBmcTest, RecordsAddedWhileUnloadedArriveOnceAfterReload)
+{
+    bmcsim::Options options;
+    options.records = temperatureRecords(2);
+    launch(options);
+    subscribe(entryEvent);
+    reload(); // unloaded
+
+    const auto ids =
+        bmc().addRecords({temperatureRecord(0, 0), temperatureRecord(0, 0),
+                          temperatureRecord(0, 0)});
+    ASSERT_EQ(ids.size(), 3u);
+    subscribe(entryEvent);
+    for (const std::uint16_t id : ids)
+    {
+        const auto indication = next();
+        ASSERT_TRUE(indication.has_value()) << "no event for record " << id;
+        EXPECT_THAT(text(indication->instance, "AlertingManagedElement"),
+                    HasSubstr(recordIdKey(id)));
+    }
+    EXPECT_TRUE(more().empty());
+
+    // Another restart announces nothing old.
+    reload();
+    subscribe(entryEvent);
+    EXPECT_TRUE(more().empty());
+}
+
+TEST_F(AlertsOnBmcTest, ClearWhileUnloadedYieldsOneClearEvent)
+{
+    bmcsim::Options options;
+    options.records = temperatureRecords(3);
+    launch(options);
+    subscribe(clearEvent);
+    reload();
+
+    bmc().clearSel();
+    subscribe(clearEvent);
+    const auto indication = next();
+    ASSERT_TRUE(indication.has_value()) << "no clear event";
+    EXPECT_EQ(indication->instance.path.className, clearEvent);
+    EXPECT_TRUE(more().empty());
+
+    reload();
+    subscribe(clearEvent);
+    EXPECT_TRUE(more().empty());
+}
+
+TEST_F(AlertsOnBmcTest, PollerRecoversFromAFrozenBmc)
+{
+    constexpr unsigned timeoutMs = 500;
+    launch({}, timeoutMs);
+    subscribe(entryEvent);
+
+    bmc().freeze();
+    std::this_thread::sleep_for(std::chrono::milliseconds(3 * timeoutMs));
+    bmc().thaw();
+    const auto ids =
+        bmc().addRecords({temperatureRecord(0, 0), temperatureRecord(0, 0)});
+    for (const std::uint16_t id : ids)
+    {
+        const auto indication = next();
+        ASSERT_TRUE(indication.has_value()) << "no event for record " << id;
+        EXPECT_THAT(text(indication->instance, "AlertingManagedElement"),
+                    HasSubstr(recordIdKey(id)));
+    }
+    EXPECT_TRUE(more().empty());
+}
+
+TEST_F(AlertsOnBmcTest, IdlePollsSendOneRequestEach)
+{
+    bmcsim::Options options;
+    options.records = temperatureRecords(5);
+    launch(options);
+    subscribe(entryEvent);
+    waitForPolls(1);
+
+    const std::uint64_t requests = ipmi().requestCount();
+    const std::uint64_t polls = ipmi().pollCount();
+    waitForPolls(5);
+    const std::uint64_t pollsDone = ipmi().pollCount() - polls;
+    const std::uint64_t sent = ipmi().requestCount() - requests;
+    // A poll may be under way at either end.
+    EXPECT_GE(sent + 1, pollsDone);
+    EXPECT_LE(sent, pollsDone + 1);
+}
+
+TEST_F(AlertsOnBmcTest, LastUnsubscribeStopsThePoller)
+{
+    launch({});
+    subscribe(entryEvent);
+    ASSERT_EQ(host().disableIndications().rc, CMPI_RC_OK);
+    EXPECT_FALSE(ipmi().polling());
+    const std::uint64_t polls = ipmi().pollCount();
+    std::this_thread::sleep_for(quietSpell);
+    EXPECT_EQ(ipmi().pollCount(), polls);
+}
+
+} // namespace
