@@ -108,6 +108,7 @@ TEST_F(IpmiSettingsTest, EveryKeyIsParsed)
         "ipmi.timeout = 3000\n"
         "ipmi.retransmission-timeout = 300\n"
         "ipmi.sel-warning-fill = 80\n"
+        "ipmi.poll-interval = 250\n"
         "ipmi.sel-clock = local\n"
         "ipmi.sel-capacity = 8192\n"
         "ipmi.sel-wraps = yes\n"
@@ -126,6 +127,7 @@ TEST_F(IpmiSettingsTest, EveryKeyIsParsed)
     EXPECT_EQ(ipmi.timeoutMs, 3000u);
     EXPECT_EQ(ipmi.retransmissionTimeoutMs, 300u);
     EXPECT_EQ(ipmi.warningFillPercent, 80u);
+    EXPECT_EQ(ipmi.pollIntervalMs, 250u);
     EXPECT_EQ(ipmi.selClock, Ipmi::SelClock::Local);
     EXPECT_EQ(ipmi.selCapacity, 8192u);
     EXPECT_TRUE(ipmi.selWraps);
@@ -151,6 +153,8 @@ TEST_F(IpmiSettingsTest, BadValuesNameTheKey)
               "\"serial\"");
     EXPECT_THAT(error("ipmi.timeout = 5s\n"),
                 HasSubstr("ipmi.timeout must be a whole number"));
+    EXPECT_THAT(error("ipmi.poll-interval = 10\n"),
+                HasSubstr("ipmi.poll-interval must be a whole number from 50"));
     EXPECT_EQ(error("ipmi.workarounds = nosuch\n"),
               "platform.conf:1: ipmi.workarounds: unknown workaround "
               "\"nosuch\"");
