@@ -3,8 +3,11 @@
 # exported factories, against a BMC: OpenIPMI's BMC simulator on 127.0.0.1,
 # reached over IPMI 2.0 LAN (RMCP+) and seeded with the sample SEL's
 # records. Enumerate the log and its entries, get one entry by its path,
-# clear the log and look again. The simulator is stopped by its PID at the
-# end, also when a step fails.
+# clear the log and look again. Then indications: first raised by the
+# in-memory source, then caused by real IPMI traffic to a second simulator
+# (records added, the SEL cleared and filled, the watchdog expiring). The
+# simulators and the watcher are stopped by their PIDs at the end, also
+# when a step fails.
 set -euo pipefail
 cd "$(dirname "$0")/.."
 
@@ -19,7 +22,16 @@ fi
 
 bmcsim=build/bin/bmcsim
 bench=$(mktemp -d /tmp/selprov-bmc.XXXXXX)
+alerts_bench="$bench/alerts"
+watcher=""
 stop_simulator() {
+    if [[ -n $watcher ]]; then
+        kill "$watcher" 2>/dev/null || true
+        wait "$watcher" 2>/dev/null || true
+    fi
+    if [[ -f $alerts_bench/bmcsim.pid ]]; then
+        "$bmcsim" stop --dir "$alerts_bench" || true
+    fi
     "$bmcsim" stop --dir "$bench" || true
     rm -rf "$bench"
 }
@@ -91,3 +103,54 @@ echo
 echo "\$ selprov --config memory.conf watch --raise entry,clear,warning,full,restart --count 5 --timeout 30"
 build/bin/selprov --config "$memory_conf" watch --raise entry,clear,warning,full,restart \
     --count 5 --timeout 30
+
+# ---------------------------------------------------------------------------
+# Indications caused by real IPMI traffic: selprov watch on the IPMI source,
+# polling a second simulator (8-record SEL, empty) every 250 ms, while this
+# script adds records, lets the watchdog expire (hard reset), clears the SEL
+# and fills it: entry events, a restart event with cause "Watchdog", a clear
+# event, then "Warning" at 6 records and "Critical" at 8.
+# ---------------------------------------------------------------------------
+mkdir -p "$alerts_bench"
+alerts_sim=$("$bmcsim" start --dir "$alerts_bench" --max-records 8)
+alerts_host=$(sed -n 's/^host=//p' <<<"$alerts_sim")
+echo
+echo "BMC simulator for alerts: $alerts_host (pid $(sed -n 's/^pid=//p' <<<"$alerts_sim"))"
+alerts_conf="$alerts_bench/platform.conf"
+sed -e "s|^ipmi.host = .*|ipmi.host = $alerts_host|" \
+    -e "s|^ipmi.state-directory = .*|ipmi.state-directory = $alerts_bench/platform-state|" \
+    -e "s|^log.sink = .*|log.sink = none|" \
+    "$bench/platform.conf" >"$alerts_conf"
+printf 'ipmi.poll-interval = 250\n' >>"$alerts_conf"
+watch_ipmi=(build/bin/selprov --config "$alerts_conf" watch)
+
+# A first short watch leaves what it saw in the state directory, so the
+# real watcher announces everything added from here on, even what comes
+# before its first poll.
+"${watch_ipmi[@]}" --timeout 1 >/dev/null
+echo "\$ selprov --config ipmi.conf watch --count 15 --timeout 60   (in the background)"
+"${watch_ipmi[@]}" --count 15 --timeout 60 &
+watcher=$!
+step() {
+    sleep 1.5
+    echo "# $*"
+}
+step "bmcsim add --count 2: two records"
+"$bmcsim" add --dir "$alerts_bench" --count 2
+step "bmcsim watchdog: the watchdog expires after 1 s with a hard reset"
+"$bmcsim" watchdog --dir "$alerts_bench" --tenths 10
+step "bmcsim clear: the SEL is cleared"
+"$bmcsim" clear --dir "$alerts_bench"
+step "bmcsim add --count 4, then 2: six of eight records, the warning fill"
+"$bmcsim" add --dir "$alerts_bench" --count 4
+sleep 0.5
+"$bmcsim" add --dir "$alerts_bench" --count 2
+step "bmcsim add --count 2: the SEL is full"
+"$bmcsim" add --dir "$alerts_bench" --count 2
+watch_status=0
+wait "$watcher" || watch_status=$?
+watcher=""
+if ((watch_status != 0)); then
+    echo "selprov watch on the IPMI source ended with status $watch_status" >&2
+    exit "$watch_status"
+fi
