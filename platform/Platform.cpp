@@ -20,6 +20,31 @@ namespace
 std::mutex sourceMutex;
 std::shared_ptr<InstrumentationSource> activeSource;
 
+// Ends the source, and with it its threads (the IPMI poller, the alert
+// dispatcher), when the library is unloaded or the process exits: object
+// managers unload an idle provider after calling only its cleanup, and a
+// thread left running in unmapped code would crash them. Made after the
+// logger, so it is destroyed before it: those threads may still log.
+struct SourceTeardown
+{
+    SourceTeardown()
+    {
+        CVLog::CVLogger::settings();
+    }
+    ~SourceTeardown()
+    {
+        std::shared_ptr<InstrumentationSource> source;
+        {
+            const std::lock_guard lock(sourceMutex);
+            source = std::move(activeSource);
+        }
+        source.reset();
+    }
+    SourceTeardown(const SourceTeardown&) = delete;
+    SourceTeardown& operator=(const SourceTeardown&) = delete;
+};
+const SourceTeardown sourceTeardown;
+
 std::vector<std::string> splitComponents(const std::string& list)
 {
     std::vector<std::string> components;

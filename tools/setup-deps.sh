@@ -4,7 +4,8 @@
 set -euo pipefail
 
 # FreeIPMI is the platform's IPMI library; OpenIPMI's BMC simulator
-# (ipmi_sim) and ipmitool serve the tests, the main job and the benchmark.
+# (ipmi_sim) and ipmitool serve the tests, the main job and the benchmark;
+# libopenipmi-dev has the headers of the simulator module tools/bmcsim builds.
 packages=(cmake ninja-build g++ pkg-config googletest libgtest-dev
           libgmock-dev libbenchmark-dev clang-format
           dpkg-dev file lintian

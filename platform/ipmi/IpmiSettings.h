@@ -38,7 +38,7 @@ struct Settings
     unsigned timeoutMs = 5000;
     unsigned retransmissionTimeoutMs = 1000;
     unsigned warningFillPercent = 75;
-    unsigned pollIntervalMs = 5000; // how often monitoring asks the BMC
+    unsigned pollIntervalMs = 2000; // how often monitoring asks the BMC
     SelClock selClock = SelClock::Utc;
     unsigned selCapacity = 0; // records; 0: from Get SEL Info
     bool selWraps = false;

@@ -5,6 +5,7 @@
 #include "IpmiSession.h"
 #include "IpmiSource.h"
 
+#include <algorithm>
 #include <map>
 #include <stdexcept>
 
@@ -121,6 +122,16 @@ makeIpmiSource(Settings settings, const std::string& configurationFile)
         auto source = std::make_shared<IpmiSource>(
             std::move(session), std::move(describer), settings,
             "Baseboard Management Controller, " + peer, alertState);
+        const unsigned sessionIdleMs = std::min(settings.timeoutMs / 2, 15000u);
+        if (settings.interface == Interface::Lan &&
+            settings.pollIntervalMs >= sessionIdleMs)
+        {
+            logLine(logLevelInfo, "makeIpmiSource", __LINE__,
+                    "ipmi.poll-interval " +
+                        std::to_string(settings.pollIntervalMs) +
+                        " ms is not below " + std::to_string(sessionIdleMs) +
+                        " ms: every poll opens a new LAN session");
+        }
         logLine(logLevelInfo, "makeIpmiSource", __LINE__,
                 "IPMI instrumentation: " + peer + ", privilege " +
                     settings.privilege + ", timeout " +

@@ -16,7 +16,6 @@
 #include <OpenIPMI/lanserv.h>
 #include <OpenIPMI/mcserv.h>
 #include <OpenIPMI/serv.h>
-
 #include <stdio.h>
 #include <stdlib.h>
 
@@ -27,10 +26,10 @@
 
 static unsigned char restart_cause = CAUSE_UNKNOWN;
 static unsigned char restart_channel = 0;
-static int (*previous_hw_op)(channel_t *chan, unsigned int op);
+static int (*previous_hw_op)(channel_t* chan, unsigned int op);
 
-static void get_restart_cause(lmc_data_t *mc, msg_t *msg, unsigned char *rdata,
-                              unsigned int *rdata_len, void *cb_data)
+static void get_restart_cause(lmc_data_t* mc, msg_t* msg, unsigned char* rdata,
+                              unsigned int* rdata_len, void* cb_data)
 {
     (void)mc;
     (void)msg;
@@ -43,7 +42,7 @@ static void get_restart_cause(lmc_data_t *mc, msg_t *msg, unsigned char *rdata,
 
 /* The simulator asks the system channel to reset or switch power only
  * when the watchdog expires with such an action. */
-static int system_hw_op(channel_t *chan, unsigned int op)
+static int system_hw_op(channel_t* chan, unsigned int op)
 {
     switch (op)
     {
@@ -65,10 +64,10 @@ static int system_hw_op(channel_t *chan, unsigned int op)
     return 0;
 }
 
-static int console_restart_cause(emu_out_t *out, emu_data_t *emu,
-                                 lmc_data_t *mc, char **toks)
+static int console_restart_cause(emu_out_t* out, emu_data_t* emu,
+                                 lmc_data_t* mc, char** toks)
 {
-    const char *err = NULL;
+    const char* err = NULL;
     unsigned int cause = 0;
     unsigned int channel = 0;
     (void)emu;
@@ -87,11 +86,11 @@ static int console_restart_cause(emu_out_t *out, emu_data_t *emu,
     return 0;
 }
 
-static void give_system_channel_power(sys_data_t *sys)
+static void give_system_channel_power(sys_data_t* sys)
 {
-    lmc_data_t *mc = sys->ipmb_addrs[BMC_ADDRESS];
-    channel_t **channels;
-    channel_t *system;
+    lmc_data_t* mc = sys->ipmb_addrs[BMC_ADDRESS];
+    channel_t** channels;
+    channel_t* system;
     if (!mc || !sys->mc_get_channelset)
     {
         fprintf(stderr, "restart module: no BMC at 0x%x\n", BMC_ADDRESS);
@@ -112,7 +111,7 @@ static void give_system_channel_power(sys_data_t *sys)
     system->hw_capabilities |= (1 << HW_OP_RESET) | (1 << HW_OP_POWERON);
 }
 
-int ipmi_sim_module_print_version(sys_data_t *sys, char *options)
+int ipmi_sim_module_print_version(sys_data_t* sys, char* options)
 {
     (void)sys;
     (void)options;
@@ -120,7 +119,7 @@ int ipmi_sim_module_print_version(sys_data_t *sys, char *options)
     return 0;
 }
 
-int ipmi_sim_module_init(sys_data_t *sys, char *options)
+int ipmi_sim_module_init(sys_data_t* sys, char* options)
 {
     int rv;
     (void)sys;
@@ -137,7 +136,7 @@ int ipmi_sim_module_init(sys_data_t *sys, char *options)
     return ipmi_emu_add_cmd("restart_cause", NOMC, console_restart_cause);
 }
 
-int ipmi_sim_module_post_init(sys_data_t *sys)
+int ipmi_sim_module_post_init(sys_data_t* sys)
 {
     give_system_channel_power(sys);
     return 0;
