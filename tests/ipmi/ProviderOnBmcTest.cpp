@@ -207,7 +207,9 @@ TEST_F(BmcTest, AddedRecordsShowUpInTheNextRequest)
 
 TEST_F(BmcTest, BmcWithoutRestartCauseGivesNoRestartCause)
 {
-    start(sampleSel());
+    bmcsim::Options plain = sampleSel();
+    plain.restartModule = false; // the simulator as OpenIPMI ships it
+    start(plain);
     QX::Instrumentation cursor;
     cursor.selectNode(Watchdog);
     ASSERT_TRUE(cursor);

@@ -68,8 +68,32 @@ TEST_F(SessionTest, IdleSessionIsReplacedBeforeTheNextExchange)
 
 TEST_F(SessionTest, BmcWithoutTheCommandGivesNoRestartCause)
 {
+    bmcsim::Options plain;
+    plain.restartModule = false; // the simulator as OpenIPMI ships it
+    bmc.reset();
+    bmc = std::make_unique<bmcsim::SimulatedBmc>(plain);
+    bmc->start();
     IpmiSession session(parameters());
     EXPECT_EQ(session.getSystemRestartCause(), std::nullopt);
+}
+
+TEST_F(SessionTest, RestartCauseIsWatchdogAfterTheWatchdogReset)
+{
+    if (!bmcsim::SimulatedBmc::moduleAvailable())
+    {
+        GTEST_SKIP() << "the simulator module was not built";
+    }
+    IpmiSession session(parameters());
+    EXPECT_EQ(session.getSystemRestartCause(), std::optional<std::uint8_t>(0));
+    bmc->startWatchdog(bmcsim::WatchdogAction::HardReset, 1);
+    const auto deadline =
+        std::chrono::steady_clock::now() + std::chrono::seconds(10);
+    while (session.getSystemRestartCause() != std::optional<std::uint8_t>(4) &&
+           std::chrono::steady_clock::now() < deadline)
+    {
+        std::this_thread::sleep_for(std::chrono::milliseconds(50));
+    }
+    EXPECT_EQ(session.getSystemRestartCause(), std::optional<std::uint8_t>(4));
 }
 
 TEST_F(SessionTest, CancelledReservationIsCompletionCodeC5)
