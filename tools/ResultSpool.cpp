@@ -8,15 +8,19 @@ namespace selprov
 ResultSpool::ResultSpool(bool json) : json_(json)
 {
     handlers_.instance = [this](const host::Instance& instance)
-    {
-        texts_.push_back(json_ ? host::jsonInstance(instance)
-                               : host::formatMof(instance));
+    { keep(json_ ? host::jsonInstance(instance) : host::formatMof(instance)); };
+    handlers_.path = [this](const host::ObjectPath& path) {
+        keep(json_ ? host::jsonString(path.toString())
+                   : path.toString() + "\n");
     };
-    handlers_.path = [this](const host::ObjectPath& path)
-    {
-        texts_.push_back(json_ ? host::jsonString(path.toString())
-                               : path.toString() + "\n");
-    };
+}
+
+void ResultSpool::keep(std::string text)
+{
+    // A text built by appending may hold twice its length; thousands of
+    // them are kept until the request ends.
+    text.shrink_to_fit();
+    texts_.push_back(std::move(text));
 }
 
 const host::ResultHandlers* ResultSpool::handlers() const

@@ -31,6 +31,7 @@ class ResultSpool
     void printPaths(std::ostream& out) const;
 
   private:
+    void keep(std::string text);
     void printJsonArray(std::ostream& out) const;
 
     bool json_;
