@@ -44,6 +44,9 @@ void measure(benchmark::State& state, std::size_t expected,
              const std::function<std::size_t()>& request)
 {
     const auto entries = static_cast<double>(state.range(0));
+    // One request first, untimed: the allocator settles on the size of
+    // the request, whatever the benchmarks before this one left behind.
+    request();
     bench::resetPeak();
     const bench::HeapTally before = bench::heapTally();
     for (auto _ : state)
