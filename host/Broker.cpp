@@ -5,6 +5,7 @@
 #include "ValueConversion.h"
 
 #include <stdexcept>
+#include <utility>
 
 namespace host
 {
@@ -151,10 +152,21 @@ const CMPIResult* Broker::Request::result() const
     return &result_->cmpi;
 }
 
-Outcome Broker::Request::finish(CMPIStatus status)
+void Broker::Request::streamTo(const ResultHandlers* handlers)
 {
     const std::lock_guard lock(result_->mutex);
-    Outcome out = outcome_;
+    result_->handlers = handlers;
+}
+
+Outcome Broker::Request::finish(CMPIStatus status)
+{
+    // Moved out, not copied: a large enumeration would otherwise be held
+    // twice at its peak. The result stays usable and collects anew.
+    Outcome out;
+    {
+        const std::lock_guard lock(result_->mutex);
+        out = std::exchange(outcome_, Outcome{});
+    }
     out.rc = status.rc;
     out.message = status.msg ? toText(status.msg) : std::nullopt;
     return out;

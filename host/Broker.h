@@ -85,7 +85,12 @@ class Broker
 
         const CMPIContext* context() const;
         const CMPIResult* result() const;
-        // The status and everything returned so far, copied out.
+        // From now on, results with a handler in @p handlers go to it
+        // instead of into the Outcome; nullptr collects them again.
+        // @p handlers must outlive the request or the next streamTo().
+        void streamTo(const ResultHandlers* handlers);
+        // The status and everything returned so far, handed over: what
+        // the provider returns afterwards goes to the next finish().
         Outcome finish(CMPIStatus status);
 
       private:

@@ -205,13 +205,15 @@ CMPIIndicationMI* Host::indicationMI()
     return indicationMI_;
 }
 
-Outcome Host::enumerateInstanceNames(const ObjectPath& reference)
+Outcome Host::enumerateInstanceNames(const ObjectPath& reference,
+                                     const ResultHandlers* handlers)
 {
     if (instanceMI_->ft->enumerateInstanceNames == nullptr)
     {
         return missingSlot("enumerateInstanceNames");
     }
     Broker::Request request(broker_);
+    request.streamTo(handlers);
     const CMPIStatus status = instanceMI_->ft->enumerateInstanceNames(
         instanceMI_, request.context(), request.result(),
         broker_.makeObjectPath(reference));
@@ -219,13 +221,15 @@ Outcome Host::enumerateInstanceNames(const ObjectPath& reference)
 }
 
 Outcome Host::enumerateInstances(const ObjectPath& reference,
-                                 const std::vector<std::string>* properties)
+                                 const std::vector<std::string>* properties,
+                                 const ResultHandlers* handlers)
 {
     if (instanceMI_->ft->enumerateInstances == nullptr)
     {
         return missingSlot("enumerateInstances");
     }
     Broker::Request request(broker_);
+    request.streamTo(handlers);
     PropertyList list(properties);
     const CMPIStatus status = instanceMI_->ft->enumerateInstances(
         instanceMI_, request.context(), request.result(),
@@ -234,13 +238,15 @@ Outcome Host::enumerateInstances(const ObjectPath& reference,
 }
 
 Outcome Host::getInstance(const ObjectPath& path,
-                          const std::vector<std::string>* properties)
+                          const std::vector<std::string>* properties,
+                          const ResultHandlers* handlers)
 {
     if (instanceMI_->ft->getInstance == nullptr)
     {
         return missingSlot("getInstance");
     }
     Broker::Request request(broker_);
+    request.streamTo(handlers);
     PropertyList list(properties);
     const CMPIStatus status = instanceMI_->ft->getInstance(
         instanceMI_, request.context(), request.result(),

@@ -76,12 +76,17 @@ class Host
     CMPIMethodMI* methodMI();
     CMPIIndicationMI* indicationMI();
 
-    Outcome enumerateInstanceNames(const ObjectPath& reference);
+    // With @p handlers, the results go to them as the provider returns
+    // them (see ResultHandlers) rather than into the Outcome.
+    Outcome enumerateInstanceNames(const ObjectPath& reference,
+                                   const ResultHandlers* handlers = nullptr);
     Outcome
     enumerateInstances(const ObjectPath& reference,
-                       const std::vector<std::string>* properties = nullptr);
+                       const std::vector<std::string>* properties = nullptr,
+                       const ResultHandlers* handlers = nullptr);
     Outcome getInstance(const ObjectPath& path,
-                        const std::vector<std::string>* properties = nullptr);
+                        const std::vector<std::string>* properties = nullptr,
+                        const ResultHandlers* handlers = nullptr);
     Outcome createInstance(const ObjectPath& path, const Instance& instance);
     Outcome
     modifyInstance(const ObjectPath& path, const Instance& instance,

@@ -29,6 +29,7 @@ ObjectPath InstanceObject::effectivePath() const
         return result;
     }
     NamedValues ordered;
+    ordered.reserve(keys->keys.size() + path.keys.size());
     for (const auto& [keyName, type] : keys->keys)
     {
         const Value* property = findNamed(properties, keyName);

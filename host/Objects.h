@@ -139,6 +139,7 @@ struct ResultObject : Encapsulated<CMPIResult, CMPIResultFT, &resultFT>
         return from<ResultObject>(r);
     }
     Outcome* outcome = nullptr;
+    const ResultHandlers* handlers = nullptr; // guarded by mutex
     std::mutex mutex;
 };
 

@@ -4,6 +4,8 @@
 
 #include <cmpidt.h>
 
+#include <cstddef>
+#include <functional>
 #include <optional>
 #include <string>
 #include <vector>
@@ -26,6 +28,19 @@ struct Outcome
     // was null or not one of the broker's.
     unsigned rejectedInstances = 0;
     unsigned rejectedPaths = 0;
+    // Instances and paths passed to ResultHandlers instead of collected.
+    std::size_t streamedInstances = 0;
+    std::size_t streamedPaths = 0;
+};
+
+// Receives each instance or object path as the provider returns it, on the
+// returning thread, one call at a time and in order. A result with a
+// handler is not collected in the Outcome: a caller that only prints or
+// counts the results of a large enumeration need not hold them all.
+struct ResultHandlers
+{
+    std::function<void(const Instance&)> instance;
+    std::function<void(const ObjectPath&)> path;
 };
 
 } // namespace host

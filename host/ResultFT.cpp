@@ -7,6 +7,22 @@ namespace host::detail
 namespace
 {
 
+// Gives a result to the caller's handler; what the handler throws must not
+// unwind through the provider's C frames.
+template <typename Handler, typename Result>
+CMPIStatus handOver(const Handler& handler, const Result& result)
+{
+    try
+    {
+        handler(result);
+        return okStatus();
+    }
+    catch (...)
+    {
+        return errorStatus(CMPI_RC_ERR_FAILED);
+    }
+}
+
 CMPIStatus resultReturnData(const CMPIResult* rslt, const CMPIValue* value,
                             const CMPIType type)
 {
@@ -45,6 +61,11 @@ CMPIStatus resultReturnInstance(const CMPIResult* rslt,
     }
     Instance copy = i->snapshot();
     const std::lock_guard lock(r->mutex);
+    if (r->handlers != nullptr && r->handlers->instance)
+    {
+        ++r->outcome->streamedInstances;
+        return handOver(r->handlers->instance, copy);
+    }
     r->outcome->instances.push_back(std::move(copy));
     return okStatus();
 }
@@ -67,6 +88,11 @@ CMPIStatus resultReturnObjectPath(const CMPIResult* rslt,
                                           : CMPI_RC_ERR_INVALID_HANDLE);
     }
     const std::lock_guard lock(r->mutex);
+    if (r->handlers != nullptr && r->handlers->path)
+    {
+        ++r->outcome->streamedPaths;
+        return handOver(r->handlers->path, p->path);
+    }
     r->outcome->paths.push_back(p->path);
     return okStatus();
 }

@@ -3,6 +3,7 @@
 #include "Names.h"
 #include "WbemText.h"
 
+#include <algorithm>
 #include <array>
 
 namespace host
@@ -178,6 +179,14 @@ void setNamed(NamedValues& values, std::string name, Value value)
             v = std::move(value);
             return;
         }
+    }
+    if (values.size() == values.capacity())
+    {
+        // Grow by half, not double: instances and paths are built a value
+        // at a time and live to the end of their request, each holding
+        // whatever spare room its last growth left.
+        values.reserve(values.size() +
+                       std::max<std::size_t>(4, values.size() / 2));
     }
     values.emplace_back(std::move(name), std::move(value));
 }

@@ -205,7 +205,10 @@ int getMgmtHwLogEntryInstances(EntryMap& entries)
                             entry.messageTimestamp =
                                 convertTimestampToCIM(scratch);
                         }
-                        entries[key] = std::move(entry);
+                        // Entries come in path order, so the place for
+                        // the key is nearly always the end of the map.
+                        entries.insert_or_assign(entries.end(), key,
+                                                 std::move(entry));
                         ++entryCursor;
                     }
                     status = 0;

@@ -3,6 +3,7 @@
 #include "CommandLine.h"
 #include "Host.h"
 #include "Printing.h"
+#include "ResultSpool.h"
 #include "StatusText.h"
 #include "Watch.h"
 
@@ -87,32 +88,6 @@ host::ObjectPath classPath(const selprov::Options& o,
     return path;
 }
 
-void printPaths(const selprov::Options& o, const host::Outcome& out)
-{
-    if (o.json)
-    {
-        std::cout << host::jsonPaths(out.paths);
-        return;
-    }
-    for (const host::ObjectPath& p : out.paths)
-    {
-        std::cout << p.toString() << "\n";
-    }
-}
-
-void printInstances(const selprov::Options& o, const host::Outcome& out)
-{
-    if (o.json)
-    {
-        std::cout << host::jsonInstances(out.instances);
-        return;
-    }
-    for (std::size_t i = 0; i < out.instances.size(); ++i)
-    {
-        std::cout << (i ? "\n" : "") << host::formatMof(out.instances[i]);
-    }
-}
-
 void printReturnValue(const selprov::Options& o, const host::Outcome& out)
 {
     if (out.data.empty())
@@ -131,7 +106,8 @@ void printReturnValue(const selprov::Options& o, const host::Outcome& out)
 }
 
 // Calls the provider; with --timing, writes how long the call took (the
-// provider's work and the broker's, without printing) to standard error.
+// provider's work, the broker's and the formatting of the results, without
+// printing) to standard error.
 template <typename Call>
 host::Outcome timed(const selprov::Options& o, Call call)
 {
@@ -156,40 +132,53 @@ host::Outcome run(const selprov::Options& o, host::Host& h)
     switch (o.command)
     {
         case Command::EnumerateNames:
-            out = timed(
-                o, [&]
-                { return h.enumerateInstanceNames(classPath(o, o.target)); });
+        {
+            const selprov::ResultSpool spool(o.json);
+            out = timed(o,
+                        [&] {
+                            return h.enumerateInstanceNames(
+                                classPath(o, o.target), spool.handlers());
+                        });
             if (out.rc == CMPI_RC_OK)
             {
-                printPaths(o, out);
+                spool.printPaths(std::cout);
             }
             break;
+        }
         case Command::Enumerate:
+        {
+            const selprov::ResultSpool spool(o.json);
             out = timed(o,
                         [&]
                         {
                             return h.enumerateInstances(
                                 classPath(o, o.target),
-                                o.properties ? &*o.properties : nullptr);
+                                o.properties ? &*o.properties : nullptr,
+                                spool.handlers());
                         });
             if (out.rc == CMPI_RC_OK)
             {
-                printInstances(o, out);
+                spool.printInstances(std::cout);
             }
             break;
+        }
         case Command::Get:
+        {
+            const selprov::ResultSpool spool(o.json);
             out = timed(o,
                         [&]
                         {
                             return h.getInstance(targetPath(o),
                                                  o.properties ? &*o.properties
-                                                              : nullptr);
+                                                              : nullptr,
+                                                 spool.handlers());
                         });
             if (out.rc == CMPI_RC_OK)
             {
-                printInstances(o, out);
+                spool.printInstances(std::cout);
             }
             break;
+        }
         case Command::ClearLog:
         {
             const host::ObjectPath logClass = classPath(o, "ZAN_MgmtHwLog");

@@ -1,0 +1,125 @@
+// Cost per log entry of whole instance requests, through the loaded
+// provider library and the in-process broker, on generated logs of 1,000,
+// 8,192 and 65,535 entries. Each benchmark reports:
+//   per_entry            CPU time of one request divided by the entries
+//   bytes_per_entry      heap bytes the request allocates, per entry
+//   peak_bytes_per_entry the most heap the request holds at once, per entry
+// A request whose cost per entry stays flat as the log grows is linear;
+// bench/scaling.sh prints the ratios between the sizes.
+#include "AllocationCounter.h"
+#include "CVLogger.h"
+#include "Fixture.h"
+#include "Host.h"
+#include "MemorySource.h"
+#include "Platform.h"
+
+#include <functional>
+#include <sstream>
+
+#include <benchmark/benchmark.h>
+
+namespace
+{
+
+void useGeneratedLog(unsigned entries)
+{
+    CVLog::CVLogger::setSink(nullptr);
+    std::stringstream fixture;
+    QX::writeGeneratedFixture(fixture, entries, 65535);
+    QX::Platform::overrideSource(std::make_shared<QX::MemorySource>(
+        QX::parseFixture(fixture, "generated")));
+}
+
+host::ObjectPath entryClass()
+{
+    host::ObjectPath reference;
+    reference.nameSpace = "root/zanqx";
+    reference.className = "ZAN_MgmtHwLogEntry";
+    return reference;
+}
+
+// Runs @p request once per iteration and sets the per-entry counters;
+// @p request returns how many results it got, which must be @p expected.
+void measure(benchmark::State& state, std::size_t expected,
+             const std::function<std::size_t()>& request)
+{
+    const auto entries = static_cast<double>(state.range(0));
+    // One request first, untimed: the allocator settles on the size of
+    // the request, whatever the benchmarks before this one left behind.
+    request();
+    bench::resetPeak();
+    const bench::HeapTally before = bench::heapTally();
+    for (auto _ : state)
+    {
+        const std::size_t results = request();
+        if (results != expected)
+        {
+            state.SkipWithError("the request returned the wrong count");
+            break;
+        }
+    }
+    const bench::HeapTally after = bench::heapTally();
+    using benchmark::Counter;
+    state.counters["per_entry"] =
+        Counter(entries, Counter::kIsIterationInvariantRate | Counter::kInvert);
+    state.counters["bytes_per_entry"] = Counter(
+        static_cast<double>(after.allocatedBytes - before.allocatedBytes) /
+            entries,
+        Counter::kAvgIterations);
+    state.counters["peak_bytes_per_entry"] = Counter(
+        static_cast<double>(after.peakLiveBytes - before.liveBytes) / entries);
+}
+
+void BM_ScalingEnumerateInstances(benchmark::State& state)
+{
+    const auto entries = static_cast<unsigned>(state.range(0));
+    useGeneratedLog(entries);
+    {
+        host::Host host(SELPROV_LIBRARY);
+        measure(
+            state, entries,
+            [&]
+            { return host.enumerateInstances(entryClass()).instances.size(); });
+    }
+    QX::Platform::overrideSource(nullptr);
+}
+
+void BM_ScalingEnumerateInstanceNames(benchmark::State& state)
+{
+    const auto entries = static_cast<unsigned>(state.range(0));
+    useGeneratedLog(entries);
+    {
+        host::Host host(SELPROV_LIBRARY);
+        measure(
+            state, entries,
+            [&]
+            { return host.enumerateInstanceNames(entryClass()).paths.size(); });
+    }
+    QX::Platform::overrideSource(nullptr);
+}
+
+// One entry, from the middle of the log, by its full path.
+void BM_ScalingGetInstance(benchmark::State& state)
+{
+    const auto entries = static_cast<unsigned>(state.range(0));
+    useGeneratedLog(entries);
+    {
+        host::Host host(SELPROV_LIBRARY);
+        const auto names = host.enumerateInstanceNames(entryClass());
+        const host::ObjectPath target = names.paths.at(names.paths.size() / 2);
+        measure(state, 1,
+                [&] { return host.getInstance(target).instances.size(); });
+    }
+    QX::Platform::overrideSource(nullptr);
+}
+
+void logSizes(benchmark::internal::Benchmark* b)
+{
+    b->Arg(1000)->Arg(8192)->Arg(65535)->Unit(benchmark::kMillisecond);
+}
+
+BENCHMARK(BM_ScalingEnumerateInstances)->Apply(logSizes);
+BENCHMARK(BM_ScalingEnumerateInstanceNames)->Apply(logSizes);
+BENCHMARK(BM_ScalingGetInstance)->Apply(logSizes);
+
+} // namespace
