@@ -18,6 +18,8 @@
 set -euo pipefail
 cd "$(dirname "$0")/.."
 
+. tools/simulated-bmc-conf.sh
+
 runs=${1:-3}
 bin=build/bin
 for tool in selprov bmcsim selfixture; do
@@ -105,19 +107,7 @@ for records in 1000 5000; do
     host=$(sed -n 's/^host=//p' <<<"$simulator")
     port=${host##*:}
 
-    umask 077
-    printf 'password\n' >"$bench/password"
-    cat >"$bench/ipmi.conf" <<EOF
-source = ipmi
-ipmi.interface = lan
-ipmi.host = $host
-ipmi.user = admin
-ipmi.password-file = $bench/password
-ipmi.privilege = admin
-ipmi.workarounds = opensesspriv
-ipmi.state-directory = $bench/platform-state
-log.sink = none
-EOF
+    simulated_bmc_conf "$bench/ipmi.conf" "$host" "$bench" "log.sink = none"
     "$bin/selfixture" "$records" >"$bench/memory.fixture"
     printf 'source = memory\nmemory.fixture = %s\nlog.sink = none\n' \
         "$bench/memory.fixture" >"$bench/memory.conf"

@@ -15,45 +15,26 @@ namespace QX::SELComposite
 template <typename T>
 struct CmpiTypeOf; // deliberately undefined for every other type
 
-template <>
-struct CmpiTypeOf<std::uint8_t>
+/** One row of the table below: the type code of @p T and the member of
+ *  CMPIValue that holds it. */
+template <typename T, CMPIType Code, auto Member>
+struct CmpiField
 {
-    static constexpr CMPIType type = CMPI_uint8;
-    static void store(CMPIValue& value, std::uint8_t number)
+    static constexpr CMPIType type = Code;
+    static void store(CMPIValue& value, T number)
     {
-        value.uint8 = number;
+        value.*Member = number;
     }
 };
 
-template <>
-struct CmpiTypeOf<std::uint16_t>
-{
-    static constexpr CMPIType type = CMPI_uint16;
-    static void store(CMPIValue& value, std::uint16_t number)
-    {
-        value.uint16 = number;
-    }
-};
-
-template <>
-struct CmpiTypeOf<std::uint32_t>
-{
-    static constexpr CMPIType type = CMPI_uint32;
-    static void store(CMPIValue& value, std::uint32_t number)
-    {
-        value.uint32 = number;
-    }
-};
-
-template <>
-struct CmpiTypeOf<std::uint64_t>
-{
-    static constexpr CMPIType type = CMPI_uint64;
-    static void store(CMPIValue& value, std::uint64_t number)
-    {
-        value.uint64 = number;
-    }
-};
+// clang-format off
+template <> struct CmpiTypeOf<std::uint8_t> : CmpiField<std::uint8_t, CMPI_uint8, &CMPIValue::uint8> {};
+template <> struct CmpiTypeOf<std::uint16_t> : CmpiField<std::uint16_t, CMPI_uint16, &CMPIValue::uint16> {};
+template <> struct CmpiTypeOf<std::uint32_t> : CmpiField<std::uint32_t, CMPI_uint32, &CMPIValue::uint32> {};
+template <> struct CmpiTypeOf<std::uint64_t> : CmpiField<std::uint64_t, CMPI_uint64, &CMPIValue::uint64> {};
+template <> struct CmpiTypeOf<CMPIDateTime*> : CmpiField<CMPIDateTime*, CMPI_dateTime, &CMPIValue::dateTime> {};
+template <> struct CmpiTypeOf<CMPIString*> : CmpiField<CMPIString*, CMPI_string, &CMPIValue::string> {};
+// clang-format on
 
 template <>
 struct CmpiTypeOf<bool>
@@ -62,26 +43,6 @@ struct CmpiTypeOf<bool>
     static void store(CMPIValue& value, bool flag)
     {
         value.boolean = flag ? 1 : 0;
-    }
-};
-
-template <>
-struct CmpiTypeOf<CMPIDateTime*>
-{
-    static constexpr CMPIType type = CMPI_dateTime;
-    static void store(CMPIValue& value, CMPIDateTime* dateTime)
-    {
-        value.dateTime = dateTime;
-    }
-};
-
-template <>
-struct CmpiTypeOf<CMPIString*>
-{
-    static constexpr CMPIType type = CMPI_string;
-    static void store(CMPIValue& value, CMPIString* string)
-    {
-        value.string = string;
     }
 };
 

@@ -1,7 +1,10 @@
 #include "InstanceFrame.h"
 
 #include "CmpiValues.h"
+#include "PropertySelection.h"
+#include "SELObjectFactory.h"
 #include "Support.h"
+#include "sdk/qxlib/include/Trace.h"
 
 #include <string>
 
@@ -10,6 +13,8 @@ namespace QX::SELComposite
 
 namespace
 {
+
+constexpr const char* unitFile = "SELObjectFactory.cpp";
 
 const char* requestNamespace(const CMPIObjectPath* requestPath,
                              CMPIStatus* status)
@@ -45,6 +50,31 @@ InstanceFrame newInstanceFrame(const CMPIBroker* broker,
     frame.instance = broker->eft->newInstance(broker, path, nullptr);
     frame.usable = isUsable(frame.instance);
     return frame;
+}
+
+CMPIInstance* buildInstance(const char* function, const CMPIBroker* broker,
+                            const CMPIObjectPath* requestPath,
+                            const char* className, const char** keys,
+                            const char** properties, bool keysOnly,
+                            CMPIStatus* status, const InstanceFill& fill)
+{
+    logFunctionEdge(function, unitFile, __LINE__, loggerSELObjectFactory,
+                    ENTRY_TRACE);
+    const PropertySelection selection(properties, keysOnly);
+    const InstanceFrame frame =
+        newInstanceFrame(broker, requestPath, className, status);
+    if (frame.usable)
+    {
+        if (!keysOnly)
+        {
+            frame.instance->ft->setPropertyFilter(frame.instance, properties,
+                                                  keys);
+        }
+        fill(frame.instance, selection);
+    }
+    logFunctionEdge(function, unitFile, __LINE__, loggerSELObjectFactory,
+                    EXIT_TRACE);
+    return frame.instance;
 }
 
 } // namespace QX::SELComposite

@@ -2,7 +2,6 @@
 #include "InstanceFrame.h"
 #include "PropertySelection.h"
 #include "SELObjectFactory.h"
-#include "sdk/qxlib/include/Trace.h"
 
 #include <string>
 #include <vector>
@@ -12,8 +11,6 @@ namespace QX::SELComposite
 
 namespace
 {
-
-constexpr const char* unitFile = "SELObjectFactory.cpp";
 
 const char* logKeys[] = {"Name", "CreationClassName", nullptr};
 
@@ -73,101 +70,94 @@ CMPIInstance* SELObjectFactory::makeMgmtHwLogInstance(
     const CMPIBroker* broker, const CMPIObjectPath* objectPath, MgmtHwLog log,
     const char** properties, bool keysOnly, CMPIStatus* status)
 {
-    constexpr const char* function = "makeMgmtHwLogInstance";
-    logFunctionEdge(function, unitFile, __LINE__, loggerSELObjectFactory,
-                    ENTRY_TRACE);
-    const PropertySelection selection(properties, keysOnly);
-    const InstanceFrame frame =
-        newInstanceFrame(broker, objectPath, LOG_CLASS_NAME, status);
-    if (frame.usable)
-    {
-        CMPIInstance* instance = frame.instance;
-        if (!keysOnly)
+    return buildInstance(
+        "makeMgmtHwLogInstance", broker, objectPath, LOG_CLASS_NAME, logKeys,
+        properties, keysOnly, status,
+        [&](CMPIInstance* instance, const PropertySelection& selection)
         {
-            instance->ft->setPropertyFilter(instance, properties, logKeys);
-        }
-        setTextProperty(instance, "Name", log.getName().c_str());
-        setTextProperty(instance, "CreationClassName", LOG_CLASS_NAME);
-        if (selection.wants("Caption"))
-        {
-            setTextProperty(instance, "Caption", "IPMI SEL LOG");
-        }
-        if (selection.wants("Description"))
-        {
-            setTextProperty(instance, "Description",
-                            "Intelligent platform Management Interface SEL");
-        }
-        if (selection.wants("ElementName"))
-        {
-            setTextProperty(instance, "ElementName",
-                            log.getElementName().c_str());
-        }
-        if (selection.wants("Status"))
-        {
-            setTextProperty(instance, "Status", log.getStatus().c_str());
-        }
-        if (selection.wants("Node"))
-        {
-            setTypedProperty(instance, "Node", log.getNode());
-        }
-        if (selection.wants("MaxNumberOfRecords"))
-        {
-            setTypedProperty(instance, "MaxNumberOfRecords",
-                             log.maxNumberOfRecords);
-        }
-        if (selection.wants("CurrentNumberOfRecords"))
-        {
-            setTypedProperty(instance, "CurrentNumberOfRecords",
-                             log.currentNumberOfRecords);
-        }
-        if (selection.wants("OverWritePolicy"))
-        {
-            setTypedProperty(instance, "OverWritePolicy", log.overwritePolicy);
-        }
-        if (selection.wants("EnabledState"))
-        {
-            setTypedProperty(instance, "EnabledState", log.enabledState);
-        }
-        if (selection.wants("RequestedState"))
-        {
-            setTypedProperty(instance, "RequestedState", log.requestedState);
-        }
-        if (selection.wants("CharacterSet"))
-        {
-            setTypedProperty(instance, "CharacterSet", log.getCharacterSet());
-        }
-        if (selection.wants("MaxLogSize"))
-        {
-            setTypedProperty(instance, "MaxLogSize", log.getMaxLogSize());
-        }
-        if (selection.wants("PercentageNearFull"))
-        {
-            setTypedProperty(instance, "PercentageNearFull",
-                             log.getPercentageNearFull());
-        }
-        if (selection.wants("IsFrozen"))
-        {
-            setTypedProperty(instance, "IsFrozen", log.getIsFrozen());
-        }
-        if (selection.wants("OperationalStatus"))
-        {
-            setUint16Array(broker, instance, "OperationalStatus",
-                           log.getOperationalStatus());
-        }
-        if (selection.wants("Capabilities"))
-        {
-            setUint16Array(broker, instance, "Capabilities",
-                           log.getCapabilities());
-        }
-        if (selection.wants("StatusDescriptions"))
-        {
-            setStringArray(broker, instance, "StatusDescriptions",
-                           log.getStatusDescriptions());
-        }
-    }
-    logFunctionEdge(function, unitFile, __LINE__, loggerSELObjectFactory,
-                    EXIT_TRACE);
-    return frame.instance;
+            setTextProperty(instance, "Name", log.getName().c_str());
+            setTextProperty(instance, "CreationClassName", LOG_CLASS_NAME);
+            if (selection.wants("Caption"))
+            {
+                setTextProperty(instance, "Caption", "IPMI SEL LOG");
+            }
+            if (selection.wants("Description"))
+            {
+                setTextProperty(
+                    instance, "Description",
+                    "Intelligent platform Management Interface SEL");
+            }
+            if (selection.wants("ElementName"))
+            {
+                setTextProperty(instance, "ElementName",
+                                log.getElementName().c_str());
+            }
+            if (selection.wants("Status"))
+            {
+                setTextProperty(instance, "Status", log.getStatus().c_str());
+            }
+            if (selection.wants("Node"))
+            {
+                setTypedProperty(instance, "Node", log.getNode());
+            }
+            if (selection.wants("MaxNumberOfRecords"))
+            {
+                setTypedProperty(instance, "MaxNumberOfRecords",
+                                 log.maxNumberOfRecords);
+            }
+            if (selection.wants("CurrentNumberOfRecords"))
+            {
+                setTypedProperty(instance, "CurrentNumberOfRecords",
+                                 log.currentNumberOfRecords);
+            }
+            if (selection.wants("OverWritePolicy"))
+            {
+                setTypedProperty(instance, "OverWritePolicy",
+                                 log.overwritePolicy);
+            }
+            if (selection.wants("EnabledState"))
+            {
+                setTypedProperty(instance, "EnabledState", log.enabledState);
+            }
+            if (selection.wants("RequestedState"))
+            {
+                setTypedProperty(instance, "RequestedState",
+                                 log.requestedState);
+            }
+            if (selection.wants("CharacterSet"))
+            {
+                setTypedProperty(instance, "CharacterSet",
+                                 log.getCharacterSet());
+            }
+            if (selection.wants("MaxLogSize"))
+            {
+                setTypedProperty(instance, "MaxLogSize", log.getMaxLogSize());
+            }
+            if (selection.wants("PercentageNearFull"))
+            {
+                setTypedProperty(instance, "PercentageNearFull",
+                                 log.getPercentageNearFull());
+            }
+            if (selection.wants("IsFrozen"))
+            {
+                setTypedProperty(instance, "IsFrozen", log.getIsFrozen());
+            }
+            if (selection.wants("OperationalStatus"))
+            {
+                setUint16Array(broker, instance, "OperationalStatus",
+                               log.getOperationalStatus());
+            }
+            if (selection.wants("Capabilities"))
+            {
+                setUint16Array(broker, instance, "Capabilities",
+                               log.getCapabilities());
+            }
+            if (selection.wants("StatusDescriptions"))
+            {
+                setStringArray(broker, instance, "StatusDescriptions",
+                               log.getStatusDescriptions());
+            }
+        });
 }
 
 } // namespace QX::SELComposite

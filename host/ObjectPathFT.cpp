@@ -163,8 +163,10 @@ CMPICount opGetKeyCount(const CMPIObjectPath* op, CMPIStatus* rc)
     return static_cast<CMPICount>(p->path.keys.size());
 }
 
-CMPIStatus opSetNameSpaceFromObjectPath(CMPIObjectPath* op,
-                                        const CMPIObjectPath* src)
+/** Copies the namespace of @p src into @p op, and its host as well when
+ *  @p withHost. */
+CMPIStatus copyLocation(CMPIObjectPath* op, const CMPIObjectPath* src,
+                        bool withHost)
 {
     Op* p = Op::of(op);
     const Op* from = Op::of(src);
@@ -173,21 +175,23 @@ CMPIStatus opSetNameSpaceFromObjectPath(CMPIObjectPath* op,
         return errorStatus(CMPI_RC_ERR_INVALID_HANDLE);
     }
     p->path.nameSpace = from->path.nameSpace;
+    if (withHost)
+    {
+        p->path.host = from->path.host;
+    }
     return okStatus();
+}
+
+CMPIStatus opSetNameSpaceFromObjectPath(CMPIObjectPath* op,
+                                        const CMPIObjectPath* src)
+{
+    return copyLocation(op, src, false);
 }
 
 CMPIStatus opSetHostAndNameSpaceFromObjectPath(CMPIObjectPath* op,
                                                const CMPIObjectPath* src)
 {
-    Op* p = Op::of(op);
-    const Op* from = Op::of(src);
-    if (p == nullptr || from == nullptr)
-    {
-        return errorStatus(CMPI_RC_ERR_INVALID_HANDLE);
-    }
-    p->path.nameSpace = from->path.nameSpace;
-    p->path.host = from->path.host;
-    return okStatus();
+    return copyLocation(op, src, true);
 }
 
 CMPIData opGetClassQualifier(const CMPIObjectPath*, const char*, CMPIStatus* rc)

@@ -3,11 +3,14 @@
 #include "CIMDateTime.h"
 #include "CmpiValues.h"
 #include "IndicationTrace.h"
+#include "Instrumentation.h"
 #include "Resources.h"
 #include "Support.h"
 
 #include <algorithm>
 #include <cwchar>
+#include <exception>
+#include <iostream>
 #include <vector>
 
 namespace QX::SELComposite::indication
@@ -192,6 +195,62 @@ void setCommonTail(CMPIInstance* instance)
     setTextProperty(instance, "ProviderName", "SELProvider");
     const std::string uid = make_string(Product::getUid());
     setTextProperty(instance, "UniqueSystemID", uid.c_str());
+}
+
+void setAlertTimes(CMPIInstance* instance, CMPIDateTime* alertTime)
+{
+    setTypedProperty(instance, "IndicationTime", alertTime);
+    setTypedProperty(instance, "EventTime", alertTime);
+}
+
+void setMessage(CMPIInstance* instance, const std::string& message)
+{
+    setTextProperty(instance, "Message", message.c_str());
+    setTextProperty(instance, "Description", message.c_str());
+}
+
+void setAlertTail(CMPIInstance* instance, std::uint16_t alertType)
+{
+    setTypedProperty(instance, "AlertingElementFormat", std::uint16_t{2});
+    setTypedProperty(instance, "AlertType", alertType);
+    setTypedProperty(instance, "ProbableCause", std::uint16_t{1});
+    setCommonTail(instance);
+}
+
+CMPIInstance* buildEvent(const char* function, const char* className,
+                         CMPIObjectPath** path, const DateTime& time,
+                         const EventFill& fill)
+{
+    traceEntry(function, __LINE__);
+    const CMPIBroker* const broker = _alertSELBroker.load();
+    CMPIInstance* instance =
+        broker != nullptr ? newEventInstance(broker, className, function, path)
+                          : nullptr;
+    if (isUsable(instance) &&
+        !fill(broker, instance, newAlertTime(broker, time)))
+    {
+        instance = nullptr;
+    }
+    traceExit(function, __LINE__);
+    return instance;
+}
+
+bool walkInstrumentation(const char* function,
+                         const std::function<bool(Instrumentation&)>& walk)
+{
+    traceEntry(function, __LINE__);
+    bool found = false;
+    try
+    {
+        Instrumentation node;
+        found = walk(node);
+    }
+    catch (const std::exception& error)
+    {
+        std::cerr << error.what() << std::endl;
+    }
+    traceExit(function, __LINE__);
+    return found;
 }
 
 std::string localizedMessage(const wchar_t* identifier)

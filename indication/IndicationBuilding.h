@@ -10,7 +10,14 @@
 #include <cmpift.h>
 
 #include <cstddef>
+#include <cstdint>
+#include <functional>
 #include <string>
+
+namespace QX
+{
+class Instrumentation;
+}
 
 namespace QX::SELComposite::indication
 {
@@ -57,6 +64,43 @@ void setNoCorrelatedIndications(const CMPIBroker* broker,
 
 /** Rows 13 to 17 of every indication: the system and the provider. */
 void setCommonTail(CMPIInstance* instance);
+
+/** "IndicationTime" and "EventTime", both the alert time. */
+void setAlertTimes(CMPIInstance* instance, CMPIDateTime* alertTime);
+
+/** "Message" and "Description", both the localised message. */
+void setMessage(CMPIInstance* instance, const std::string& message);
+
+/** "AlertingElementFormat" 2, "AlertType" @p alertType, "ProbableCause" 1,
+ *  then the common tail: how every indication ends. */
+void setAlertTail(CMPIInstance* instance, std::uint16_t alertType);
+
+/** Fills a new event instance: the broker, the instance and the alert time;
+ *  false when the instance must not be delivered. */
+using EventFill =
+    std::function<bool(const CMPIBroker*, CMPIInstance*, CMPIDateTime*)>;
+
+/**
+ * @brief Builds one indication instance of @p className, framed by the
+ *        ENTERING and EXITING lines of @p function.
+ *
+ * Without an alert broker gives null; when the instance cannot be made
+ * gives what the broker gave. Otherwise makes the alert time from @p time
+ * and hands both to @p fill; gives the instance, or null when @p fill
+ * refuses it. @p path receives the instance's object path when there is
+ * one.
+ */
+CMPIInstance* buildEvent(const char* function, const char* className,
+                         CMPIObjectPath** path, const DateTime& time,
+                         const EventFill& fill);
+
+/**
+ * @brief Runs @p walk over a fresh instrumentation cursor, framed by the
+ *        ENTERING and EXITING lines of @p function, and gives its answer;
+ *        an exception is written to standard error and gives false.
+ */
+bool walkInstrumentation(const char* function,
+                         const std::function<bool(Instrumentation&)>& walk);
 
 /** Wide buffer sizes of the localised messages. */
 constexpr std::size_t messageBufferSize = 512;

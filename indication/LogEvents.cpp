@@ -5,8 +5,6 @@
 #include "SELIndication.h"
 
 #include <cstdint>
-#include <exception>
-#include <iostream>
 
 namespace QX::SELComposite
 {
@@ -37,6 +35,13 @@ CMPIObjectPath* newLogElementPath(const CMPIBroker* broker,
     return element;
 }
 
+/** "AlertingManagedElement": the string form of the log's path. */
+void setAlertingElement(CMPIInstance* instance, const CMPIObjectPath* element)
+{
+    const std::string elementText = pathText(element);
+    setTextProperty(instance, "AlertingManagedElement", elementText.c_str());
+}
+
 std::uint16_t fullSeverity(const std::string& condition)
 {
     if (condition == "Critical")
@@ -61,109 +66,87 @@ bool getLogInstrumentation(std::string nodePath, std::string& logPath,
                            std::string& condition)
 {
     constexpr const char* function = "getLogInstrumentation";
-    traceEntry(function, __LINE__);
-    bool found = false;
-    try
-    {
-        Instrumentation node;
-        node.selectNode(NodeLexicon::ManagementController);
-        if (node)
+    return walkInstrumentation(
+        function,
+        [&](Instrumentation& node)
         {
+            node.selectNode(NodeLexicon::ManagementController);
+            if (!node)
+            {
+                return false;
+            }
             logPath = node.convertPathToString(nodePath);
             static_cast<void>(node.getPathToParentNode());
             const std::string controllerPath = node.getPathToNode();
             node.selectNode(NodeLexicon::EventLog);
-            if (node)
+            if (!node)
             {
-                node.setFilter(NodeLexicon::Parent, controllerPath);
-                if (node.getPathToNode() == nodePath)
-                {
-                    const unsigned status = node.getNodeStatus();
-                    traceVariable(function, __LINE__, "newStatus", status);
-                    if (status == NodeLexicon::EventLogStatusAlmostFull)
-                    {
-                        condition = "Warning";
-                        found = true;
-                    }
-                    else if (status == NodeLexicon::EventLogStatusFull)
-                    {
-                        condition = "Critical";
-                        found = true;
-                    }
-                    else if (status == NodeLexicon::EventLogStatusCleared)
-                    {
-                        bool empty = false;
-                        if (!node.getProperty(NodeLexicon::IsEmpty, empty))
-                        {
-                            traceMessage(function, __LINE__, LOG_LEVEL_FAILURE,
-                                         "Failed while reading Empty "
-                                         "property.");
-                        }
-                        else
-                        {
-                            traceVariable(function, __LINE__, "empty",
-                                          static_cast<unsigned>(empty));
-                            if (empty)
-                            {
-                                condition = "IsEmpty";
-                                found = true;
-                            }
-                        }
-                    }
-                }
+                return false;
             }
-        }
-    }
-    catch (const std::exception& error)
-    {
-        std::cerr << error.what() << std::endl;
-        found = false;
-    }
-    traceExit(function, __LINE__);
-    return found;
+            node.setFilter(NodeLexicon::Parent, controllerPath);
+            if (node.getPathToNode() != nodePath)
+            {
+                return false;
+            }
+            const unsigned status = node.getNodeStatus();
+            traceVariable(function, __LINE__, "newStatus", status);
+            if (status == NodeLexicon::EventLogStatusAlmostFull)
+            {
+                condition = "Warning";
+                return true;
+            }
+            if (status == NodeLexicon::EventLogStatusFull)
+            {
+                condition = "Critical";
+                return true;
+            }
+            if (status != NodeLexicon::EventLogStatusCleared)
+            {
+                return false;
+            }
+            bool empty = false;
+            if (!node.getProperty(NodeLexicon::IsEmpty, empty))
+            {
+                traceMessage(function, __LINE__, LOG_LEVEL_FAILURE,
+                             "Failed while reading Empty property.");
+                return false;
+            }
+            traceVariable(function, __LINE__, "empty",
+                          static_cast<unsigned>(empty));
+            if (empty)
+            {
+                condition = "IsEmpty";
+            }
+            return empty;
+        });
 }
 
 CMPIInstance* createLogClearIndicationInstance(std::string logPath,
                                                DateTime time)
 {
     constexpr const char* function = "createLogClearIndicationInstance";
-    traceEntry(function, __LINE__);
-    const CMPIBroker* const broker = _alertSELBroker.load();
-    CMPIInstance* instance =
-        broker != nullptr
-            ? newEventInstance(broker, LOG_CLEAR_EVENT_CLASS, function, nullptr)
-            : nullptr;
-    if (!isUsable(instance))
-    {
-        traceExit(function, __LINE__);
-        return instance;
-    }
-    CMPIDateTime* const alertTime = newAlertTime(broker, time);
-    setTextProperty(instance, "IndicationIdentifier", logEventLogName);
-    const std::string eventId = "Log Clear Event: " + logPath;
-    setTextProperty(instance, "EventID", eventId.c_str());
-    CMPIObjectPath* const element = newLogElementPath(broker, function);
-    if (element == nullptr)
-    {
-        traceExit(function, __LINE__);
-        return nullptr;
-    }
-    const std::string elementText = pathText(element);
-    setTextProperty(instance, "AlertingManagedElement", elementText.c_str());
-    setTypedProperty(instance, "IndicationTime", alertTime);
-    setTypedProperty(instance, "EventTime", alertTime);
-    setNoCorrelatedIndications(broker, instance);
-    setTypedProperty(instance, "PerceivedSeverity", std::uint16_t{2});
-    traceMessage(function, __LINE__, LOG_LEVEL_PROVIDER, "Before NLS");
-    const std::string message = localizedMessage(L"MSGID_SEL_LOG_CLEARED");
-    setTextProperty(instance, "Message", message.c_str());
-    setTextProperty(instance, "Description", message.c_str());
-    setTypedProperty(instance, "AlertingElementFormat", std::uint16_t{2});
-    setTypedProperty(instance, "AlertType", std::uint16_t{5});
-    setTypedProperty(instance, "ProbableCause", std::uint16_t{1});
-    setCommonTail(instance);
-    traceExit(function, __LINE__);
-    return instance;
+    return buildEvent(
+        function, LOG_CLEAR_EVENT_CLASS, nullptr, time,
+        [&](const CMPIBroker* broker, CMPIInstance* instance,
+            CMPIDateTime* alertTime)
+        {
+            setTextProperty(instance, "IndicationIdentifier", logEventLogName);
+            const std::string eventId = "Log Clear Event: " + logPath;
+            setTextProperty(instance, "EventID", eventId.c_str());
+            CMPIObjectPath* const element = newLogElementPath(broker, function);
+            if (element == nullptr)
+            {
+                return false;
+            }
+            setAlertingElement(instance, element);
+            setAlertTimes(instance, alertTime);
+            setNoCorrelatedIndications(broker, instance);
+            setTypedProperty(instance, "PerceivedSeverity", std::uint16_t{2});
+            traceMessage(function, __LINE__, LOG_LEVEL_PROVIDER, "Before NLS");
+            setMessage(instance, localizedMessage(L"MSGID_SEL_LOG_CLEARED"));
+            setAlertTail(instance, 5);
+            return true;
+        });
 }
 
 CMPIInstance* createLogFullIndicationInstance(std::string logPath,
@@ -171,50 +154,37 @@ CMPIInstance* createLogFullIndicationInstance(std::string logPath,
                                               std::string condition)
 {
     constexpr const char* function = "createLogFullIndicationInstance";
-    traceEntry(function, __LINE__);
-    const CMPIBroker* const broker = _alertSELBroker.load();
-    CMPIInstance* instance =
-        broker != nullptr
-            ? newEventInstance(broker, LOG_FULL_EVENT_CLASS, function, nullptr)
-            : nullptr;
-    if (!isUsable(instance))
-    {
-        traceExit(function, __LINE__);
-        return instance;
-    }
-    CMPIDateTime* const alertTime = newAlertTime(broker, time);
-    const std::string identifier = "IMPI SEL Log Full : " + logPath;
-    setTextProperty(instance, "IndicationIdentifier", identifier.c_str());
-    const std::string eventId =
-        "IPMI Log Full " + condition + " Event" + " : " + logPath;
-    setTextProperty(instance, "EventID", eventId.c_str());
-    traceMessage(function, __LINE__, LOG_LEVEL_PROVIDER,
-                 "Before creatin objectPAth for LOG class");
-    CMPIObjectPath* const element = newLogElementPath(broker, function);
-    if (element == nullptr)
-    {
-        traceExit(function, __LINE__);
-        return nullptr;
-    }
-    traceMessage(function, __LINE__, LOG_LEVEL_PROVIDER,
-                 "success creatin objectPAth for LOG class");
-    const std::string elementText = pathText(element);
-    setTextProperty(instance, "AlertingManagedElement", elementText.c_str());
-    setTypedProperty(instance, "IndicationTime", alertTime);
-    setTypedProperty(instance, "EventTime", alertTime);
-    setNoCorrelatedIndications(broker, instance);
-    setTypedProperty(instance, "PerceivedSeverity", fullSeverity(condition));
-    traceMessage(function, __LINE__, LOG_LEVEL_PROVIDER, "Before NLS");
-    const std::string message =
-        localizedMessage(L"MSGID_SEL_LOG_FULL", fullPercentage(condition));
-    setTextProperty(instance, "Message", message.c_str());
-    setTextProperty(instance, "Description", message.c_str());
-    setTypedProperty(instance, "AlertingElementFormat", std::uint16_t{2});
-    setTypedProperty(instance, "AlertType", std::uint16_t{3});
-    setTypedProperty(instance, "ProbableCause", std::uint16_t{1});
-    setCommonTail(instance);
-    traceExit(function, __LINE__);
-    return instance;
+    return buildEvent(
+        function, LOG_FULL_EVENT_CLASS, nullptr, time,
+        [&](const CMPIBroker* broker, CMPIInstance* instance,
+            CMPIDateTime* alertTime)
+        {
+            const std::string identifier = "IMPI SEL Log Full : " + logPath;
+            setTextProperty(instance, "IndicationIdentifier",
+                            identifier.c_str());
+            const std::string eventId =
+                "IPMI Log Full " + condition + " Event" + " : " + logPath;
+            setTextProperty(instance, "EventID", eventId.c_str());
+            traceMessage(function, __LINE__, LOG_LEVEL_PROVIDER,
+                         "Before creatin objectPAth for LOG class");
+            CMPIObjectPath* const element = newLogElementPath(broker, function);
+            if (element == nullptr)
+            {
+                return false;
+            }
+            traceMessage(function, __LINE__, LOG_LEVEL_PROVIDER,
+                         "success creatin objectPAth for LOG class");
+            setAlertingElement(instance, element);
+            setAlertTimes(instance, alertTime);
+            setNoCorrelatedIndications(broker, instance);
+            setTypedProperty(instance, "PerceivedSeverity",
+                             fullSeverity(condition));
+            traceMessage(function, __LINE__, LOG_LEVEL_PROVIDER, "Before NLS");
+            setMessage(instance, localizedMessage(L"MSGID_SEL_LOG_FULL",
+                                                  fullPercentage(condition)));
+            setAlertTail(instance, 3);
+            return true;
+        });
 }
 
 } // namespace QX::SELComposite

@@ -10,17 +10,17 @@
 namespace QX::SELComposite
 {
 
-void Watches::start(NodeLexicon::NodeType kind, MonitorCallback handler)
+namespace
+{
+
+/** Runs @p change on the platform's current source; an exception is
+ *  written to standard error. */
+template <typename Change>
+void onCurrentSource(Change change)
 {
     try
     {
-        auto source = Platform::currentSource();
-        {
-            Instrumentation cursor(source);
-            cursor.startMonitoring(kind, handler, nullptr);
-        }
-        const std::lock_guard lock(mutex_);
-        registrations_.push_back(Registration{source, kind, handler});
+        change(Platform::currentSource());
     }
     catch (const std::exception& error)
     {
@@ -28,33 +28,39 @@ void Watches::start(NodeLexicon::NodeType kind, MonitorCallback handler)
     }
 }
 
+} // namespace
+
+void Watches::start(NodeLexicon::NodeType kind, MonitorCallback handler)
+{
+    onCurrentSource(
+        [&](const auto& source)
+        {
+            Instrumentation(source).startMonitoring(kind, handler, nullptr);
+            const std::lock_guard lock(mutex_);
+            registrations_.push_back(Registration{source, kind, handler});
+        });
+}
+
 void Watches::stop(NodeLexicon::NodeType kind, MonitorCallback handler)
 {
-    try
-    {
-        auto source = Platform::currentSource();
+    onCurrentSource(
+        [&](const auto& source)
         {
-            Instrumentation cursor(source);
-            cursor.stopMonitoring(kind, handler, nullptr);
-        }
-        const std::lock_guard lock(mutex_);
-        const auto found =
-            std::find_if(registrations_.begin(), registrations_.end(),
-                         [&](const Registration& registration)
-                         {
-                             return registration.kind == kind &&
-                                    registration.handler == handler &&
-                                    registration.source.lock() == source;
-                         });
-        if (found != registrations_.end())
-        {
-            registrations_.erase(found);
-        }
-    }
-    catch (const std::exception& error)
-    {
-        std::cerr << error.what() << std::endl;
-    }
+            Instrumentation(source).stopMonitoring(kind, handler, nullptr);
+            const std::lock_guard lock(mutex_);
+            const auto found =
+                std::find_if(registrations_.begin(), registrations_.end(),
+                             [&](const Registration& registration)
+                             {
+                                 return registration.kind == kind &&
+                                        registration.handler == handler &&
+                                        registration.source.lock() == source;
+                             });
+            if (found != registrations_.end())
+            {
+                registrations_.erase(found);
+            }
+        });
 }
 
 void Watches::releaseAll() noexcept

@@ -3,6 +3,8 @@
 #include "Support.h"
 
 #include <ctime>
+#include <type_traits>
+#include <utility>
 
 namespace QX::SELComposite
 {
@@ -16,6 +18,14 @@ constexpr std::uint16_t enabledStateEnabled = 2;
 DateTime currentTime()
 {
     return DateTime(std::time(nullptr), 3);
+}
+
+/** Stores a getter's answer in its field, then gives it. */
+template <typename T>
+T remember(T& field, std::type_identity_t<T> value)
+{
+    field = std::move(value);
+    return field;
 }
 
 } // namespace
@@ -60,74 +70,64 @@ std::string MgmtHwLog::getOtherEnableState()
 
 std::string MgmtHwLog::getHeaderFormat()
 {
-    headerFormat = "";
-    return stripSpaces(headerFormat);
+    return stripSpaces(remember(headerFormat, ""));
 }
 
 std::string MgmtHwLog::getRecordHeaderFormat()
 {
-    recordHeaderFormat = "2 byte Record ID and 1 byte Record Type";
-    return stripSpaces(recordHeaderFormat);
+    return stripSpaces(remember(recordHeaderFormat,
+                                "2 byte Record ID and 1 byte Record Type"));
 }
 
 std::string MgmtHwLog::getOtherPolicyDescription()
 {
-    otherPolicyDescription = "";
-    return stripSpaces(otherPolicyDescription);
+    return stripSpaces(remember(otherPolicyDescription, ""));
 }
 
 std::string MgmtHwLog::getStatus()
 {
-    status = enabledState == enabledStateEnabled ? "OK" : "Unknown";
-    return status;
+    return remember(status,
+                    enabledState == enabledStateEnabled ? "OK" : "Unknown");
 }
 
 std::uint16_t MgmtHwLog::getCharacterSet()
 {
-    characterSet = 7;
-    return characterSet;
+    return remember(characterSet, 7);
 }
 
 std::uint16_t MgmtHwLog::getEnableDefault()
 {
-    enableDefault = 2;
-    return enableDefault;
+    return remember(enableDefault, 2);
 }
 
 std::uint64_t MgmtHwLog::getMaxLogSize()
 {
-    maxLogSize = 10240;
-    return maxLogSize;
+    return remember(maxLogSize, 10240);
 }
 
 std::uint64_t MgmtHwLog::getSizeOfHeader()
 {
-    sizeOfHeader = 0;
-    return sizeOfHeader;
+    return remember(sizeOfHeader, 0);
 }
 
 std::uint64_t MgmtHwLog::getMaxRecordSize()
 {
-    maxRecordSize = 0;
-    return maxRecordSize;
+    return remember(maxRecordSize, 0);
 }
 
 std::uint64_t MgmtHwLog::getSizeOfRecordHeader()
 {
-    sizeOfRecordHeader = 0;
-    return sizeOfRecordHeader;
+    return remember(sizeOfRecordHeader, 0);
 }
 
 std::uint64_t MgmtHwLog::getRecordLastChanged()
 {
-    recordLastChanged = 0;
-    return recordLastChanged;
+    return remember(recordLastChanged, 0);
 }
 
 bool MgmtHwLog::getIsFrozen()
 {
-    isFrozen = false;
-    return isFrozen;
+    return remember(isFrozen, false);
 }
 
 std::uint8_t MgmtHwLog::getPercentageNearFull()
@@ -184,20 +184,17 @@ std::vector<std::string> MgmtHwLog::getStatusDescriptions()
 
 DateTime MgmtHwLog::getInstallDate()
 {
-    installDate = currentTime();
-    return installDate;
+    return remember(installDate, currentTime());
 }
 
 DateTime MgmtHwLog::getTimeWhenOutdated()
 {
-    timeWhenOutdated = currentTime();
-    return timeWhenOutdated;
+    return remember(timeWhenOutdated, currentTime());
 }
 
 DateTime MgmtHwLog::getTimeOfLastChange()
 {
-    timeOfLastChange = currentTime();
-    return timeOfLastChange;
+    return remember(timeOfLastChange, currentTime());
 }
 
 } // namespace QX::SELComposite

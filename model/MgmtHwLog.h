@@ -50,6 +50,13 @@ class MgmtHwLog
     DateTime getTimeWhenOutdated();
     DateTime getTimeOfLastChange();
 
+    // Written by the gatherer, read directly by the instance builder.
+    std::uint16_t overwritePolicy = 0;
+    std::uint16_t enabledState = 0;
+    std::uint16_t requestedState = 0;
+    std::uint64_t maxNumberOfRecords = 0;
+    std::uint64_t currentNumberOfRecords = 0;
+
   private:
     std::string name;
     std::string elementName;
@@ -65,25 +72,11 @@ class MgmtHwLog
     std::vector<std::string> statusDescriptions;
     std::uint8_t percentageNearFull = 0;
     std::uint16_t enableDefault = 0;
-
-  public:
-    // Written by the gatherer, read directly by the instance builder.
-    std::uint16_t overwritePolicy = 0;
-    std::uint16_t enabledState = 0;
-    std::uint16_t requestedState = 0;
-
-  private:
     std::uint64_t sizeOfHeader = 0;
     std::uint64_t maxRecordSize = 0;
     std::uint64_t sizeOfRecordHeader = 0;
     std::uint64_t recordLastChanged = 0;
     std::uint64_t maxLogSize = 0;
-
-  public:
-    std::uint64_t maxNumberOfRecords = 0;
-    std::uint64_t currentNumberOfRecords = 0;
-
-  private:
     bool isFrozen = false;
     DateTime installDate;
     DateTime timeWhenOutdated;

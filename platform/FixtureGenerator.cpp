@@ -1,4 +1,5 @@
 #include "Fixture.h"
+#include "NodeLexicon.h"
 
 #include <array>
 #include <cstdio>
@@ -69,15 +70,6 @@ constexpr std::time_t firstRecordTime = 1672531200;
 /** Seconds between consecutive generated records. */
 constexpr std::time_t recordSpacing = 97;
 
-std::string formatTimestamp(std::time_t when)
-{
-    std::tm fields{};
-    gmtime_r(&when, &fields);
-    char text[32];
-    std::strftime(text, sizeof text, "%Y-%m-%d %H:%M:%S", &fields);
-    return text;
-}
-
 std::string formatRecordData(unsigned recordId, std::time_t when,
                              const EventPattern& pattern)
 {
@@ -136,7 +128,7 @@ void writeGeneratedFixture(std::ostream& out, unsigned entries,
             firstRecordTime +
             static_cast<std::time_t>(recordId - 1) * recordSpacing;
         out << "entry RecordId=" << recordId << " Timestamp=\""
-            << formatTimestamp(when) << "\" RecordData=\""
+            << NodeLexicon::timestampText(when) << "\" RecordData=\""
             << formatRecordData(recordId, when, pattern) << "\" description=\""
             << pattern.description << "\"\n";
     }

@@ -1,5 +1,7 @@
 #include "MemorySource.h"
 
+#include "NodeLexicon.h"
+
 #include <algorithm>
 #include <cstdio>
 #include <ctime>
@@ -352,15 +354,6 @@ std::string bootRecordData(unsigned recordId, std::time_t when)
     return text;
 }
 
-std::string utcTimestamp(std::time_t when)
-{
-    std::tm fields{};
-    gmtime_r(&when, &fields);
-    char text[32];
-    std::strftime(text, sizeof text, "%Y-%m-%d %H:%M:%S", &fields);
-    return text;
-}
-
 } // namespace
 
 void MemorySource::simulateRecord()
@@ -396,7 +389,7 @@ void MemorySource::simulateRecord()
         }
     }
     const std::time_t now = std::time(nullptr);
-    appendEntry(logPath, recordId, utcTimestamp(now),
+    appendEntry(logPath, recordId, NodeLexicon::timestampText(now),
                 bootRecordData(recordId, now),
                 "System Event: OEM System boot event");
 }

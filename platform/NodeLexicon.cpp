@@ -1,5 +1,7 @@
 #include "NodeLexicon.h"
 
+#include <ctime>
+
 namespace QX::NodeLexicon
 {
 
@@ -47,6 +49,15 @@ const char* propertyName(unsigned property)
         default:
             return nullptr;
     }
+}
+
+std::string timestampText(std::time_t when)
+{
+    std::tm fields{};
+    gmtime_r(&when, &fields);
+    char text[32];
+    std::strftime(text, sizeof text, "%Y-%m-%d %H:%M:%S", &fields);
+    return text;
 }
 
 } // namespace QX::NodeLexicon

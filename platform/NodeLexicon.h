@@ -1,5 +1,8 @@
 #pragma once
 
+#include <ctime>
+#include <string>
+
 namespace QX::NodeLexicon
 {
 
@@ -50,5 +53,9 @@ constexpr unsigned EventLogStatusFull = 24;
  *  nullptr for a number the lexicon does not know. */
 const char* nodeTypeName(unsigned kind);
 const char* propertyName(unsigned property);
+
+/** The text of a Timestamp property for @p when: "YYYY-MM-DD hh:mm:ss" in
+ *  UTC. */
+std::string timestampText(std::time_t when);
 
 } // namespace QX::NodeLexicon

@@ -1,37 +1,37 @@
 #include "CmpiValues.h"
+#include "ProviderTrace.h"
 #include "SELIndication.h"
 #include "SELProvider.h"
-#include "sdk/qxlib/include/Trace.h"
+
+#include <optional>
 
 namespace QX::SELComposite
 {
 
+using namespace provider;
+
 namespace
 {
 
-constexpr const char* unitFile = "SELProvider.cpp";
-
-void markEntry(const char* function, int line)
+/** The indication id of the class named by the filter's class path, after
+ *  tracing that name; none for a class that has none. The status of both
+ *  queries goes to @p status. */
+std::optional<unsigned short> filterIndicationId(const char* function,
+                                                 const CMPIObjectPath* path,
+                                                 CMPIStatus* status)
 {
-    markProviderEntry(loggerSELProvider, function, unitFile,
-                      static_cast<unsigned>(line));
-}
-
-void markExit(const char* function, int line)
-{
-    markProviderExit(loggerSELProvider, function, unitFile,
-                     static_cast<unsigned>(line));
-}
-
-/** The indication class named by the filter's class path; the status of
- *  both queries goes to @p status. */
-const char* indicationClassOf(const CMPIObjectPath* path, CMPIStatus* status)
-{
-    if (path == nullptr || path->ft == nullptr)
+    const char* className =
+        path == nullptr || path->ft == nullptr
+            ? nullptr
+            : charsOf(path->ft->getClassName(path, status), status);
+    logVariable(function, unitFile, __LINE__, loggerSELProvider, "className",
+                className);
+    unsigned short id = UNKNOWN_INDICATION_ID;
+    if (!getSELIndicationId(className, id))
     {
-        return nullptr;
+        return std::nullopt;
     }
-    return charsOf(path->ft->getClassName(path, status), status);
+    return id;
 }
 
 } // namespace
@@ -43,11 +43,7 @@ CMPIStatus SEL_ActivateFilter(CMPIIndicationMI*, const CMPIContext* context,
     constexpr const char* function = "SEL_ActivateFilter";
     markEntry(function, __LINE__);
     CMPIStatus status{CMPI_RC_OK, nullptr};
-    unsigned short id = UNKNOWN_INDICATION_ID;
-    const char* className = indicationClassOf(objectPath, &status);
-    logVariable(function, unitFile, __LINE__, loggerSELProvider, "className",
-                className);
-    if (getSELIndicationId(className, id))
+    if (const auto id = filterIndicationId(function, objectPath, &status))
     {
         // Every activation prepares and saves a context of its own: the
         // delivery threads attach to it long after this call has returned.
@@ -57,7 +53,7 @@ CMPIStatus SEL_ActivateFilter(CMPIIndicationMI*, const CMPIContext* context,
                 ? current->bft->prepareAttachThread(current, context)
                 : nullptr;
         saveSELIndicationContext(current, prepared);
-        subscribeForSELIndication(id);
+        subscribeForSELIndication(*id);
     }
     markExit(function, __LINE__);
     return status;
@@ -70,13 +66,9 @@ CMPIStatus SEL_DeActivateFilter(CMPIIndicationMI*, const CMPIContext*,
     constexpr const char* function = "SEL_DeActivateFilter";
     markEntry(function, __LINE__);
     CMPIStatus status{CMPI_RC_OK, nullptr};
-    unsigned short id = UNKNOWN_INDICATION_ID;
-    const char* className = indicationClassOf(objectPath, &status);
-    logVariable(function, unitFile, __LINE__, loggerSELProvider, "className",
-                className);
-    if (getSELIndicationId(className, id))
+    if (const auto id = filterIndicationId(function, objectPath, &status))
     {
-        unsubscribeForSELIndication(id);
+        unsubscribeForSELIndication(*id);
     }
     markExit(function, __LINE__);
     return status;

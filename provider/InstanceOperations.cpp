@@ -1,8 +1,8 @@
 #include "CmpiValues.h"
+#include "ProviderTrace.h"
 #include "SELObjectFactory.h"
 #include "SELProvider.h"
 #include "Support.h"
-#include "sdk/qxlib/include/Trace.h"
 
 #include <cstdint>
 #include <string>
@@ -11,24 +11,13 @@
 namespace QX::SELComposite
 {
 
+using namespace provider;
+
 namespace
 {
 
-constexpr const char* unitFile = "SELProvider.cpp";
 constexpr const char* noKeysText = "At least one key should be passed";
 constexpr const char* factoryFailedText = "getAllSELCMPIInstances Failed";
-
-void markEntry(const char* function, int line)
-{
-    markProviderEntry(loggerSELProvider, function, unitFile,
-                      static_cast<unsigned>(line));
-}
-
-void markExit(const char* function, int line)
-{
-    markProviderExit(loggerSELProvider, function, unitFile,
-                     static_cast<unsigned>(line));
-}
 
 /** Characters of the class name of @p path; the status of both queries
  *  goes to @p status. */

@@ -1,7 +1,7 @@
 #include "CmpiValues.h"
+#include "ProviderTrace.h"
 #include "SELObjectFactory.h"
 #include "SELProvider.h"
-#include "sdk/qxlib/include/Trace.h"
 
 #include <cstdint>
 #include <strings.h>
@@ -9,10 +9,10 @@
 namespace QX::SELComposite
 {
 
+using namespace provider;
+
 namespace
 {
-
-constexpr const char* unitFile = "SELProvider.cpp";
 
 bool equalIgnoringCase(const char* left, const char* right)
 {

@@ -45,21 +45,9 @@ echo "BMC simulator: $host (pid $(sed -n 's/^pid=//p' <<<"$simulator"))"
 
 # The platform configuration: the IPMI source over LAN 2.0. The password
 # sits in its own file, readable by its owner only.
-umask 077
-printf 'password\n' >"$bench/bmc.password"
-cat >"$bench/platform.conf" <<EOF
-source = ipmi
-ipmi.interface = lan
-ipmi.host = $host
-ipmi.user = admin
-ipmi.password-file = $bench/bmc.password
-ipmi.privilege = admin
-ipmi.cipher-suite = 3
-ipmi.workarounds = opensesspriv
-ipmi.timeout = 5000
-ipmi.state-directory = $bench/platform-state
-log.sink = stderr
-EOF
+. tools/simulated-bmc-conf.sh
+simulated_bmc_conf "$bench/platform.conf" "$host" "$bench" \
+    "ipmi.cipher-suite = 3" "ipmi.timeout = 5000" "log.sink = stderr"
 
 selprov=(build/bin/selprov --config "$bench/platform.conf")
 run() {

@@ -46,6 +46,18 @@ const char* driverName(ipmi_driver_type_t driver)
     }
 }
 
+/** Clear SEL with @p operation under @p reservationId; gives the checked
+ *  response. */
+FiidObject clearSel(IpmiContext& context, std::uint16_t reservationId,
+                    std::uint8_t operation)
+{
+    FiidObject response(tmpl_cmd_clear_sel_rs);
+    context.check(ipmi_cmd_clear_sel(context.get(), reservationId, operation,
+                                     response.get()),
+                  "ipmi_cmd_clear_sel", response, IPMI_NET_FN_STORAGE_RQ);
+    return response;
+}
+
 } // namespace
 
 IpmiSession::IpmiSession(SessionParameters parameters) :
@@ -156,6 +168,16 @@ void IpmiSession::touch()
     lastActivity_.store(ticks(Clock::now()));
 }
 
+void IpmiSession::noteFailure(const IpmiError& error)
+{
+    touch();
+    if (error.sessionLost())
+    {
+        context_.reset();
+        lost_ = true;
+    }
+}
+
 template <typename Result, typename Work>
 Result IpmiSession::guardedCall(const std::shared_ptr<IpmiContext>& context,
                                 Work work)
@@ -250,12 +272,7 @@ Result IpmiSession::exchange(Work work)
     }
     catch (const IpmiError& error)
     {
-        touch();
-        if (error.sessionLost())
-        {
-            context_.reset();
-            lost_ = true;
-        }
+        noteFailure(error);
         throw;
     }
 }
@@ -273,12 +290,7 @@ void IpmiSession::run(const std::function<void(IpmiContext&)>& work)
     }
     catch (const IpmiError& error)
     {
-        touch();
-        if (error.sessionLost())
-        {
-            context_.reset();
-            lost_ = true;
-        }
+        noteFailure(error);
         throw;
     }
 }
@@ -344,14 +356,9 @@ SelEntry IpmiSession::getSelEntry(std::uint16_t reservationId,
 void IpmiSession::initiateSelErase(std::uint16_t reservationId)
 {
     exchange<void>(
-        [reservationId](IpmiContext& context)
-        {
-            FiidObject response(tmpl_cmd_clear_sel_rs);
-            context.check(
-                ipmi_cmd_clear_sel(context.get(), reservationId,
-                                   IPMI_SEL_CLEAR_OPERATION_INITIATE_ERASE,
-                                   response.get()),
-                "ipmi_cmd_clear_sel", response, IPMI_NET_FN_STORAGE_RQ);
+        [reservationId](IpmiContext& context) {
+            clearSel(context, reservationId,
+                     IPMI_SEL_CLEAR_OPERATION_INITIATE_ERASE);
         });
 }
 
@@ -360,12 +367,9 @@ bool IpmiSession::selEraseCompleted(std::uint16_t reservationId)
     return exchange<bool>(
         [reservationId](IpmiContext& context)
         {
-            FiidObject response(tmpl_cmd_clear_sel_rs);
-            context.check(
-                ipmi_cmd_clear_sel(context.get(), reservationId,
-                                   IPMI_SEL_CLEAR_OPERATION_GET_ERASURE_STATUS,
-                                   response.get()),
-                "ipmi_cmd_clear_sel", response, IPMI_NET_FN_STORAGE_RQ);
+            const FiidObject response =
+                clearSel(context, reservationId,
+                         IPMI_SEL_CLEAR_OPERATION_GET_ERASURE_STATUS);
             return response.field("erasure_progress") ==
                    IPMI_SEL_CLEAR_ERASE_COMPLETED;
         });

@@ -76,6 +76,8 @@ class IpmiSession : public BmcCommands
     template <typename Result, typename Work>
     Result guardedCall(const std::shared_ptr<IpmiContext>& context, Work work);
     void touch();
+    /** After a failed exchange: closes the session when it was lost. */
+    void noteFailure(const IpmiError& error);
 
     SessionParameters parameters_;
     std::chrono::milliseconds reopenAfter_;

@@ -6,6 +6,7 @@
 #include "NodeTree.h"
 #include "Platform.h"
 #include "ProvidedInstances.h"
+#include "entry/EntryFixture.h"
 
 #include <chrono>
 #include <memory>
@@ -25,11 +26,7 @@ constexpr std::chrono::seconds patience{10};
 
 std::shared_ptr<const QX::NodeTree> treeWithWatchdog()
 {
-    QX::NodeTreeBuilder tree;
-    tree.addNode(ManagementController, "/bmc0", "", "BMC", 1);
-    tree.addNode(EventLog, "/bmc0/sel", "/bmc0", "System Event Log", 1);
-    tree.setProperty("/bmc0/sel", Name, std::string("IPMI SEL Log"));
-    tree.setProperty("/bmc0/sel", MaxRecords, 512u);
+    QX::NodeTreeBuilder tree = entry::selTree(0);
     tree.setProperty("/bmc0/sel", IsEmpty, false);
     tree.addNode(Watchdog, "/bmc0/wdt", "/bmc0", "Watchdog 2", 1);
     tree.setProperty("/bmc0/wdt", RestartCause, 4u);

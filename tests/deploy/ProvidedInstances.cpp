@@ -5,6 +5,7 @@
 #include "MemorySource.h"
 #include "NodeTree.h"
 #include "Platform.h"
+#include "entry/EntryFixture.h"
 
 namespace deploy
 {
@@ -16,23 +17,12 @@ using namespace QX::NodeLexicon;
 
 std::shared_ptr<const QX::NodeTree> treeWithEveryProperty()
 {
-    QX::NodeTreeBuilder tree;
-    tree.addNode(ManagementController, "/bmc0", "", "BMC", 1);
-    tree.addNode(EventLog, "/bmc0/sel", "/bmc0", "System Event Log", 1);
-    tree.setProperty("/bmc0/sel", Name, std::string("IPMI SEL Log"));
-    tree.setProperty("/bmc0/sel", MaxRecords, 512u);
-    tree.setProperty("/bmc0/sel", OverwritePolicy, 1u);
-    tree.setProperty("/bmc0/sel", DataFormat, std::string("hex bytes"));
+    QX::NodeTreeBuilder tree = entry::selTree(0);
     tree.setProperty("/bmc0/sel", IsEmpty, false);
     for (unsigned id = 1; id <= 2; ++id)
     {
-        const std::string path = QX::MemorySource::entryPath("/bmc0/sel", id);
-        tree.addNode(EventLogEntry, path, "/bmc0/sel", "Fan FAN3: asserted", 1);
-        tree.setProperty(path, RecordId, id);
-        tree.setProperty(path, Timestamp, std::string("2024-03-04 08:15:22"));
-        tree.setProperty(path, RecordData,
-                         std::string("01 00 02 1a 83 e5 65 20 00 04 10 01 "
-                                     "6f 02 ff ff"));
+        entry::addEntry(tree, id, "2024-03-04 08:15:22", "Fan FAN3: asserted",
+                        "01 00 02 1a 83 e5 65 20 00 04 10 01 6f 02 ff ff");
     }
     return tree.build();
 }

@@ -45,28 +45,26 @@ void writeExecutable(const fs::path& path, const std::string& text)
 constexpr std::array<const char*, 9> utilities = {
     "dirname", "readlink", "cmp", "grep", "sed", "cat", "mkdir", "cp", "rm"};
 
-const char* const sfcbstage = R"(#!/bin/bash
-echo "sfcbstage $*" >> "$STUB_LOG"
-ns=root/cimv2 reg=
+// What the two SFCB staging stand-ins share after logging their call: -n
+// namespace and -r registration file, then the MOF files; their stage.
+const std::string sfcbStagingOptions = R"(ns=root/cimv2 reg=
 while getopts n:r: o; do
     case $o in n) ns=$OPTARG ;; r) reg=$OPTARG ;; esac
 done
 shift $((OPTIND - 1))
 stage=$(dirname "$0")/../var/lib/sfcb/stage
-mkdir -p "$stage/regs" "$stage/mofs/$ns"
+)";
+
+const std::string sfcbstage = R"(#!/bin/bash
+echo "sfcbstage $*" >> "$STUB_LOG"
+)" + sfcbStagingOptions + R"(mkdir -p "$stage/regs" "$stage/mofs/$ns"
 [[ -z $reg ]] || cp "$reg" "$stage/regs/"
 for mof in "$@"; do cp "$mof" "$stage/mofs/$ns/"; done
 )";
 
-const char* const sfcbunstage = R"(#!/bin/bash
+const std::string sfcbunstage = R"(#!/bin/bash
 echo "sfcbunstage $*" >> "$STUB_LOG"
-ns=root/cimv2 reg=
-while getopts n:r: o; do
-    case $o in n) ns=$OPTARG ;; r) reg=$OPTARG ;; esac
-done
-shift $((OPTIND - 1))
-stage=$(dirname "$0")/../var/lib/sfcb/stage
-[[ -z $reg ]] || rm -f "$stage/regs/$reg"
+)" + sfcbStagingOptions + R"([[ -z $reg ]] || rm -f "$stage/regs/$reg"
 for mof in "$@"; do rm -f "$stage/mofs/$ns/$mof"; done
 )";
 
@@ -170,6 +168,35 @@ class RegisterScript : public ::testing::Test
         return text;
     }
 
+    /** The commands that stage the provider with SFCB. */
+    std::string sfcbStaging() const
+    {
+        return "sfcbstage -n root/zanqx -r " + data() + "/SELProvider.reg " +
+               data() + "/SELProvider.mof\nsfcbrepos -f\n";
+    }
+    /** The command that loads the DMTF schema into OpenPegasus. */
+    std::string schemaLoading() const
+    {
+        return "cimmof -uc -n root/zanqx -I " + root_.string() + " " +
+               schema() + "\n";
+    }
+    /** The commands that load the provider's classes and registration into
+     *  OpenPegasus. */
+    std::string pegasusLoading() const
+    {
+        return "cimmof -uc -n root/zanqx " + data() +
+               "/SELProvider.mof\ncimmof -n root/PG_InterOp " + data() +
+               "/SELProviderRegistration.mof\n";
+    }
+
+    /** Runs the script with @p arguments, expecting it to succeed. */
+    ScriptRun runOk(const std::string& arguments)
+    {
+        ScriptRun result = run(arguments);
+        EXPECT_EQ(result.exitCode, 0) << arguments << ": " << result.err;
+        return result;
+    }
+
     ScriptRun run(const std::string& arguments,
                   const std::string& environment = "")
     {
@@ -262,11 +289,8 @@ TEST_F(RegisterScript, RejectsBadUsage)
 TEST_F(RegisterScript, SfcbDryRunPrintsTheCommandsAndRunsNone)
 {
     installSfcb();
-    const ScriptRun r = run("--dry-run");
-    EXPECT_EQ(r.exitCode, 0) << r.err;
-    EXPECT_EQ(r.out, "sfcbstage -n root/zanqx -r " + data() +
-                         "/SELProvider.reg " + data() +
-                         "/SELProvider.mof\nsfcbrepos -f\n");
+    const ScriptRun r = runOk("--dry-run");
+    EXPECT_EQ(r.out, sfcbStaging());
     EXPECT_EQ(calls(), "");
     EXPECT_FALSE(fs::exists(stageDir() / "regs"));
 }
@@ -274,15 +298,11 @@ TEST_F(RegisterScript, SfcbDryRunPrintsTheCommandsAndRunsNone)
 TEST_F(RegisterScript, SfcbRegistersOnceAndUnregistersOnce)
 {
     installSfcb();
-    ScriptRun r = run("");
-    EXPECT_EQ(r.exitCode, 0) << r.err;
-    EXPECT_EQ(calls(), "sfcbstage -n root/zanqx -r " + data() +
-                           "/SELProvider.reg " + data() +
-                           "/SELProvider.mof\nsfcbrepos -f\n");
+    ScriptRun r = runOk("");
+    EXPECT_EQ(calls(), sfcbStaging());
     EXPECT_THAT(r.out, HasSubstr("Restart SFCB"));
 
-    r = run("");
-    EXPECT_EQ(r.exitCode, 0) << r.err;
+    r = runOk("");
     EXPECT_THAT(r.out, HasSubstr("Already registered with SFCB"));
     EXPECT_EQ(calls(), "");
 
@@ -296,12 +316,10 @@ TEST_F(RegisterScript, SfcbRegistersOnceAndUnregistersOnce)
                      "SELProvider.mof\nsfcbrepos -f\n");
     EXPECT_EQ(calls(), "");
 
-    r = run("--unregister");
-    EXPECT_EQ(r.exitCode, 0) << r.err;
+    r = runOk("--unregister");
     EXPECT_EQ(calls(), "sfcbunstage -n root/zanqx -r SELProvider.reg "
                        "SELProvider.mof\nsfcbrepos -f\n");
-    r = run("--unregister");
-    EXPECT_EQ(r.exitCode, 0) << r.err;
+    r = runOk("--unregister");
     EXPECT_THAT(r.out, HasSubstr("Not registered with SFCB"));
     EXPECT_EQ(calls(), "");
 }
@@ -315,8 +333,7 @@ TEST_F(RegisterScript, SfcbNeedsItsStagingDirectory)
     EXPECT_THAT(r.err, HasSubstr("SFCB staging directory " +
                                  stageDir().string() + " not found"));
     fs::create_directories(root_ / "elsewhere");
-    r = run("--dry-run --sfcb-stage-dir " + (root_ / "elsewhere").string());
-    EXPECT_EQ(r.exitCode, 0) << r.err;
+    r = runOk("--dry-run --sfcb-stage-dir " + (root_ / "elsewhere").string());
 }
 
 TEST_F(RegisterScript, AFailingToolFailsTheRun)
@@ -330,52 +347,37 @@ TEST_F(RegisterScript, AFailingToolFailsTheRun)
 TEST_F(RegisterScript, PegasusDryRunQueriesButChangesNothing)
 {
     installPegasus();
-    const ScriptRun r = run("--dry-run --schema " + schema());
-    EXPECT_EQ(r.exitCode, 0) << r.err;
-    EXPECT_EQ(r.out, "cimmof -uc -n root/zanqx -I " + root_.string() + " " +
-                         schema() + "\ncimmof -uc -n root/zanqx " + data() +
-                         "/SELProvider.mof\ncimmof -n root/PG_InterOp " +
-                         data() + "/SELProviderRegistration.mof\n");
-    EXPECT_EQ(calls(), "cimprovider -l\n");
-}
-
-TEST_F(RegisterScript, PegasusRegistersOnceAndUnregistersOnce)
-{
-    installPegasus();
-    ScriptRun r = run("--schema " + schema());
-    EXPECT_EQ(r.exitCode, 0) << r.err;
-    EXPECT_EQ(calls(), "cimprovider -l\ncimmof -uc -n root/zanqx -I " +
-                           root_.string() + " " + schema() +
-                           "\ncimmof -uc -n root/zanqx " + data() +
-                           "/SELProvider.mof\ncimmof -n root/PG_InterOp " +
-                           data() + "/SELProviderRegistration.mof\n");
-    EXPECT_THAT(r.out, HasSubstr("providerDir"));
-
-    r = run("");
-    EXPECT_EQ(r.exitCode, 0) << r.err;
-    EXPECT_THAT(r.out, HasSubstr("Already registered with OpenPegasus"));
-    EXPECT_THAT(r.out, HasSubstr("cimprovider -d -m SELProviderModule"));
-    EXPECT_EQ(calls(), "cimprovider -l\n");
-
-    r = run("--unregister");
-    EXPECT_EQ(r.exitCode, 0) << r.err;
-    EXPECT_EQ(calls(), "cimprovider -l\ncimprovider -r -m SELProviderModule\n");
-    r = run("--unregister");
-    EXPECT_EQ(r.exitCode, 0) << r.err;
-    EXPECT_THAT(r.out, HasSubstr("Not registered with OpenPegasus"));
+    const ScriptRun r = runOk("--dry-run --schema " + schema());
+    EXPECT_EQ(r.out, schemaLoading() + pegasusLoading());
     EXPECT_EQ(calls(), "cimprovider -l\n");
 }
 
 TEST_F(RegisterScript, PegasusWithoutSchemaLoadsOnlyTheProviderClasses)
 {
     installPegasus();
-    const ScriptRun r = run("--dry-run");
-    EXPECT_EQ(r.exitCode, 0) << r.err;
-    EXPECT_EQ(r.out, "cimmof -uc -n root/zanqx " + data() +
-                         "/SELProvider.mof\ncimmof -n root/PG_InterOp " +
-                         data() + "/SELProviderRegistration.mof\n");
+    const ScriptRun r = runOk("--dry-run");
+    EXPECT_EQ(r.out, pegasusLoading());
     EXPECT_THAT(r.err, HasSubstr("the DMTF CIM schema must already be in "
                                  "root/zanqx"));
+}
+
+TEST_F(RegisterScript, PegasusRegistersOnceAndUnregistersOnce)
+{
+    installPegasus();
+    ScriptRun r = runOk("--schema " + schema());
+    EXPECT_EQ(calls(), "cimprovider -l\n" + schemaLoading() + pegasusLoading());
+    EXPECT_THAT(r.out, HasSubstr("providerDir"));
+
+    r = runOk("");
+    EXPECT_THAT(r.out, HasSubstr("Already registered with OpenPegasus"));
+    EXPECT_THAT(r.out, HasSubstr("cimprovider -d -m SELProviderModule"));
+    EXPECT_EQ(calls(), "cimprovider -l\n");
+
+    r = runOk("--unregister");
+    EXPECT_EQ(calls(), "cimprovider -l\ncimprovider -r -m SELProviderModule\n");
+    r = runOk("--unregister");
+    EXPECT_THAT(r.out, HasSubstr("Not registered with OpenPegasus"));
+    EXPECT_EQ(calls(), "cimprovider -l\n");
 }
 
 TEST_F(RegisterScript, PegasusServerDownIsAFailureNotAnEmptyRegistry)

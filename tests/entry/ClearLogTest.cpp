@@ -49,35 +49,44 @@ TEST_F(ClearLog, ClearsTheLog)
     EXPECT_EQ(entryCount(), 0u);
 }
 
-TEST_F(ClearLog, NamesAreMatchedIgnoringCase)
+/** A method call the provider answers with 0: how many writes reach the
+ *  instrumentation and how many of the two entries are left. */
+struct AnsweredCall
 {
+    const char* name;
+    const char* className;
+    const char* method;
+    std::uint64_t writes;
+    std::size_t entriesLeft;
+};
+
+class AnsweredMethod :
+    public ClearLog,
+    public ::testing::WithParamInterface<AnsweredCall>
+{
+};
+
+TEST_P(AnsweredMethod, ReturnsZero)
+{
+    const AnsweredCall& call = GetParam();
     install(selTree(2));
     const auto outcome =
-        host().invokeMethod(logPath("zan_mgmthwlog"), "CLEARLOG");
+        host().invokeMethod(logPath(call.className), call.method);
     EXPECT_EQ(outcome.rc, CMPI_RC_OK);
     expectReturnValue(outcome, 0);
-    EXPECT_EQ(source->acceptedWrites(), 1u);
+    EXPECT_EQ(source->acceptedWrites(), call.writes);
+    EXPECT_EQ(entryCount(), call.entriesLeft);
 }
 
-TEST_F(ClearLog, OtherMethodsAreAcceptedSilently)
-{
-    install(selTree(2));
-    const auto outcome = host().invokeMethod(logPath(), "ResetLog");
-    EXPECT_EQ(outcome.rc, CMPI_RC_OK);
-    expectReturnValue(outcome, 0);
-    EXPECT_EQ(source->acceptedWrites(), 0u);
-    EXPECT_EQ(entryCount(), 2u);
-}
-
-TEST_F(ClearLog, OnOtherClassesNothingIsCleared)
-{
-    install(selTree(2));
-    const auto outcome =
-        host().invokeMethod(logPath("ZAN_MgmtHwLogEntry"), "ClearLog");
-    EXPECT_EQ(outcome.rc, CMPI_RC_OK);
-    expectReturnValue(outcome, 0);
-    EXPECT_EQ(source->acceptedWrites(), 0u);
-}
+INSTANTIATE_TEST_SUITE_P(
+    ClearLog, AnsweredMethod,
+    ::testing::Values(AnsweredCall{"NamesAreMatchedIgnoringCase",
+                                   "zan_mgmthwlog", "CLEARLOG", 1, 0},
+                      AnsweredCall{"OtherMethodsAreAcceptedSilently",
+                                   "ZAN_MgmtHwLog", "ResetLog", 0, 2},
+                      AnsweredCall{"OnOtherClassesNothingIsCleared",
+                                   "ZAN_MgmtHwLogEntry", "ClearLog", 0, 2}),
+    [](const auto& info) { return info.param.name; });
 
 TEST_F(ClearLog, RefusedClearFails)
 {

@@ -24,13 +24,14 @@ QX::NodeTreeBuilder selTree(unsigned entries)
 }
 
 void addEntry(QX::NodeTreeBuilder& tree, unsigned recordId,
-              const std::string& timestamp, const std::string& description)
+              const std::string& timestamp, const std::string& description,
+              const std::string& recordData)
 {
     const std::string path = QX::MemorySource::entryPath("/bmc0/sel", recordId);
     tree.addNode(EventLogEntry, path, "/bmc0/sel", description, 1);
     tree.setProperty(path, RecordId, recordId);
     tree.setProperty(path, Timestamp, timestamp);
-    tree.setProperty(path, RecordData, std::string("0a 0b"));
+    tree.setProperty(path, RecordData, recordData);
 }
 
 host::ObjectPath classPath(const std::string& className)
@@ -39,6 +40,12 @@ host::ObjectPath classPath(const std::string& className)
     path.nameSpace = nameSpace;
     path.className = className;
     return path;
+}
+
+void expectComplete(const host::Outcome& outcome)
+{
+    EXPECT_EQ(outcome.rc, CMPI_RC_OK);
+    EXPECT_TRUE(outcome.done);
 }
 
 void ProviderTest::SetUp()
@@ -58,6 +65,25 @@ void ProviderTest::install(const QX::NodeTreeBuilder& tree)
 {
     source = std::make_shared<QX::MemorySource>(tree.build());
     QX::Platform::overrideSource(source);
+}
+
+void CapturingProviderTest::SetUp()
+{
+    ProviderTest::SetUp();
+    capture_ = std::make_shared<CVLog::CaptureSink>();
+    previous_ = CVLog::CVLogger::settings();
+    CVLog::CVLogger::setSink(capture_);
+    CVLog::LoggerSettings all;
+    all.logLevel = 1;
+    all.traceLevel = 1;
+    CVLog::CVLogger::configure(all);
+}
+
+void CapturingProviderTest::TearDown()
+{
+    CVLog::CVLogger::configure(previous_);
+    CVLog::CVLogger::setSink(nullptr);
+    ProviderTest::TearDown();
 }
 
 } // namespace entry

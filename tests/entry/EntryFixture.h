@@ -1,5 +1,6 @@
 #pragma once
 
+#include "CVLogger.h"
 #include "Host.h"
 #include "MemorySource.h"
 #include "NodeTree.h"
@@ -23,9 +24,13 @@ QX::NodeTreeBuilder selTree(unsigned entries);
 /** Adds entry @p recordId to /bmc0/sel. */
 void addEntry(QX::NodeTreeBuilder& tree, unsigned recordId,
               const std::string& timestamp = "2011-01-02 03:04:05",
-              const std::string& description = "Temperature CPU1: asserted");
+              const std::string& description = "Temperature CPU1: asserted",
+              const std::string& recordData = "0a 0b");
 
 host::ObjectPath classPath(const std::string& className);
+
+/** The operation answered OK and signalled the end of its results. */
+void expectComplete(const host::Outcome& outcome);
 
 /** The provider library loaded through its factories, as an object
  *  manager does, on an in-memory tree the test controls. */
@@ -49,6 +54,20 @@ class ProviderTest : public ::testing::Test
 
   private:
     std::unique_ptr<host::Host> host_;
+};
+
+/** The provider as in ProviderTest, with every diagnostic line of every
+ *  level captured in capture_. */
+class CapturingProviderTest : public ProviderTest
+{
+  protected:
+    void SetUp() override;
+    void TearDown() override;
+
+    std::shared_ptr<CVLog::CaptureSink> capture_;
+
+  private:
+    CVLog::LoggerSettings previous_;
 };
 
 } // namespace entry

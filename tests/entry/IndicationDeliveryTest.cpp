@@ -15,8 +15,6 @@ using namespace QX::NodeLexicon;
 using host::BrokerCall;
 using host::FaultMode;
 
-const QX::DateTime alertTime(2024, 5, 6, 7, 8, 9, 0, 0);
-
 class IndicationDelivery : public IndicationTest
 {
   protected:

@@ -1,5 +1,7 @@
 #include "IndicationFixture.h"
 
+#include "CapturedLines.h"
+
 namespace entry
 {
 
@@ -15,6 +17,20 @@ QX::NodeTreeBuilder selTreeWithWatchdog(unsigned entries, int restartCause)
                          static_cast<unsigned>(restartCause));
     }
     return tree;
+}
+
+void WatchdogSourceTest::SetUp()
+{
+    CVLog::CVLogger::setSink(nullptr);
+    source = std::make_shared<QX::MemorySource>(selTreeWithWatchdog(3).build());
+    QX::Platform::overrideSource(source);
+}
+
+void WatchdogSourceTest::TearDown()
+{
+    EXPECT_TRUE(source->waitForAlerts(patience));
+    host_.reset();
+    QX::Platform::overrideSource(nullptr);
 }
 
 void IndicationTest::SetUp()
@@ -78,15 +94,7 @@ void IndicationTest::settle()
 std::vector<CVLog::LogRecord>
 IndicationTest::linesWith(const std::string& text) const
 {
-    std::vector<CVLog::LogRecord> found;
-    for (const auto& record : capture->records())
-    {
-        if (record.message.find(text) != std::string::npos)
-        {
-            found.push_back(record);
-        }
-    }
-    return found;
+    return testsupport::recordsContaining(*capture, text);
 }
 
 } // namespace entry

@@ -1,6 +1,7 @@
 #pragma once
 
 #include "CVLogger.h"
+#include "DateTime.h"
 #include "EntryFixture.h"
 #include "IndicationInbox.h"
 
@@ -20,6 +21,9 @@ constexpr const char* restartEvent = "ZANx_AutomaticServerRestartEvent";
 
 /** How long a test waits for something that normally takes milliseconds. */
 constexpr std::chrono::seconds patience{10};
+
+/** The time the tests raise their alerts with. */
+inline const QX::DateTime alertTime(2024, 5, 6, 7, 8, 9, 0, 0);
 
 /** selTree(entries) with a watchdog /bmc0/wdt whose RestartCause is
  *  @p restartCause (none when negative). */
@@ -54,6 +58,21 @@ class IndicationTest : public ProviderTest
 
     std::unique_ptr<host::IndicationInbox> inbox;
     std::shared_ptr<CVLog::CaptureSink> capture;
+};
+
+/**
+ * The in-memory source on selTreeWithWatchdog(3), diagnostics silenced, for
+ * tests that load the provider in hosts of their own: the one in host_,
+ * when they make it, is unloaded after every alert was handed out.
+ */
+class WatchdogSourceTest : public ::testing::Test
+{
+  protected:
+    void SetUp() override;
+    void TearDown() override;
+
+    std::shared_ptr<QX::MemorySource> source;
+    std::unique_ptr<host::Host> host_;
 };
 
 } // namespace entry

@@ -16,24 +16,9 @@ namespace
 using namespace entry;
 using namespace QX::NodeLexicon;
 
-const QX::DateTime alertTime(2024, 5, 6, 7, 8, 9, 0, 0);
-
-class IndicationLifetime : public ::testing::Test
+class IndicationLifetime : public WatchdogSourceTest
 {
   protected:
-    void SetUp() override
-    {
-        CVLog::CVLogger::setSink(nullptr);
-        source =
-            std::make_shared<QX::MemorySource>(selTreeWithWatchdog(3).build());
-        QX::Platform::overrideSource(source);
-    }
-    void TearDown() override
-    {
-        EXPECT_TRUE(source->waitForAlerts(patience));
-        QX::Platform::overrideSource(nullptr);
-    }
-
     static void subscribeAll(host::Host& host, bool twice)
     {
         for (const char* className :
@@ -55,8 +40,6 @@ class IndicationLifetime : public ::testing::Test
                source->monitorCount(EventLogEntry) +
                source->monitorCount(Watchdog);
     }
-
-    std::shared_ptr<QX::MemorySource> source;
 };
 
 TEST_F(IndicationLifetime, UnloadingWhileAlertsFlowRemovesTheWatches)

@@ -12,8 +12,6 @@ using namespace QX::NodeLexicon;
 using host::BrokerCall;
 using host::FaultMode;
 
-const QX::DateTime alertTime(2024, 5, 6, 7, 8, 9, 0, 0);
-
 class IndicationSubscription : public IndicationTest
 {
   protected:
@@ -165,28 +163,16 @@ TEST_F(IndicationSubscription, SfcbSubscribesAndDeletesInItsOrder)
 }
 
 /** OpenPegasus: each MI gets a broker pointer of its own. */
-class PegasusOrder : public ::testing::Test
+class PegasusOrder : public WatchdogSourceTest
 {
   protected:
     void SetUp() override
     {
-        CVLog::CVLogger::setSink(nullptr);
-        source =
-            std::make_shared<QX::MemorySource>(selTreeWithWatchdog(3).build());
-        QX::Platform::overrideSource(source);
+        WatchdogSourceTest::SetUp();
         host::HostOptions options;
         options.brokerPerMI = true;
         host_ = std::make_unique<host::Host>(SELPROV_LIBRARY, options);
     }
-    void TearDown() override
-    {
-        EXPECT_TRUE(source->waitForAlerts(patience));
-        host_.reset();
-        QX::Platform::overrideSource(nullptr);
-    }
-
-    std::shared_ptr<QX::MemorySource> source;
-    std::unique_ptr<host::Host> host_;
 };
 
 TEST_F(PegasusOrder, NoAuthorizationFirstAndLastAlwaysTrue)

@@ -10,6 +10,7 @@ namespace
 {
 
 using entry::classPath;
+using entry::expectComplete;
 using entry::ProviderTest;
 using entry::selTree;
 using namespace QX::NodeLexicon;
@@ -261,8 +262,7 @@ TEST_F(InstanceOperations, GetInstanceWithoutKeyPropertiesMatchesNothing)
     const host::ObjectPath target = firstEntryPath();
     const std::vector<std::string> nodeOnly = {"Node"};
     const auto outcome = host().getInstance(target, &nodeOnly);
-    EXPECT_EQ(outcome.rc, CMPI_RC_OK);
-    EXPECT_TRUE(outcome.done);
+    expectComplete(outcome);
     EXPECT_TRUE(outcome.instances.empty());
 }
 
@@ -346,8 +346,7 @@ TEST_F(InstanceOperations, EmptyLogHasNoEntries)
     install(selTree(0));
     const auto outcome =
         host().enumerateInstances(classPath("ZAN_MgmtHwLogEntry"));
-    EXPECT_EQ(outcome.rc, CMPI_RC_OK);
-    EXPECT_TRUE(outcome.done);
+    expectComplete(outcome);
     EXPECT_TRUE(outcome.instances.empty());
 }
 
@@ -359,33 +358,46 @@ TEST_F(InstanceOperations, InstrumentationFailureGivesAnEmptyAnswer)
     const auto outcome =
         host().enumerateInstances(classPath("ZAN_MgmtHwLogEntry"));
     EXPECT_EQ(::testing::internal::GetCapturedStderr(), "BMC gone\n");
-    EXPECT_EQ(outcome.rc, CMPI_RC_OK);
-    EXPECT_TRUE(outcome.done);
+    expectComplete(outcome);
     EXPECT_TRUE(outcome.instances.empty());
 }
 
-TEST_F(InstanceOperations, LargestCountDeliversEverything)
+/** Entries in the log, and how many names an enumeration delivers: the
+ *  count is taken modulo 65536. */
+struct CountCase
 {
-    install(selTree(65535));
+    const char* name;
+    unsigned entries;
+    std::size_t names;
+};
+
+class EntryCount :
+    public ProviderTest,
+    public ::testing::WithParamInterface<CountCase>
+{
+};
+
+TEST_P(EntryCount, DeliversTheCountTakenAs16Bits)
+{
+    install(selTree(GetParam().entries));
     const auto outcome =
         host().enumerateInstanceNames(classPath("ZAN_MgmtHwLogEntry"));
-    EXPECT_EQ(outcome.rc, CMPI_RC_OK);
-    EXPECT_TRUE(outcome.done);
-    EXPECT_EQ(outcome.paths.size(), 65535u);
+    expectComplete(outcome);
+    EXPECT_EQ(outcome.paths.size(), GetParam().names);
 }
 
-TEST_F(InstanceOperations, CountIsTakenModulo65536)
-{
-    install(selTree(65537));
-    auto outcome =
-        host().enumerateInstanceNames(classPath("ZAN_MgmtHwLogEntry"));
-    EXPECT_EQ(outcome.rc, CMPI_RC_OK);
-    EXPECT_TRUE(outcome.done);
-    EXPECT_EQ(outcome.paths.size(), 1u);
+INSTANTIATE_TEST_SUITE_P(
+    InstanceOperations, EntryCount,
+    ::testing::Values(CountCase{"LargestCountDeliversEverything", 65535, 65535},
+                      CountCase{"CountIsTakenModulo65536", 65537, 1}),
+    [](const auto& info) { return info.param.name; });
 
-    source->replaceTree(selTree(65536).build());
+TEST_F(InstanceOperations, CountOf65536DeliversNoInstances)
+{
+    install(selTree(65536));
     const std::vector<std::string> none;
-    outcome = host().enumerateInstances(classPath("ZAN_MgmtHwLogEntry"), &none);
+    const auto outcome =
+        host().enumerateInstances(classPath("ZAN_MgmtHwLogEntry"), &none);
     EXPECT_TRUE(outcome.done);
     EXPECT_TRUE(outcome.instances.empty());
 }
@@ -395,30 +407,7 @@ TEST_F(InstanceOperations, CountIsTakenModulo65536)
 namespace
 {
 
-class OperationDiagnostics : public entry::ProviderTest
-{
-  protected:
-    void SetUp() override
-    {
-        ProviderTest::SetUp();
-        capture_ = std::make_shared<CVLog::CaptureSink>();
-        previous_ = CVLog::CVLogger::settings();
-        CVLog::CVLogger::setSink(capture_);
-        CVLog::LoggerSettings all;
-        all.logLevel = 1;
-        all.traceLevel = 1;
-        CVLog::CVLogger::configure(all);
-    }
-    void TearDown() override
-    {
-        CVLog::CVLogger::configure(previous_);
-        CVLog::CVLogger::setSink(nullptr);
-        ProviderTest::TearDown();
-    }
-
-    std::shared_ptr<CVLog::CaptureSink> capture_;
-    CVLog::LoggerSettings previous_;
-};
+using OperationDiagnostics = entry::CapturingProviderTest;
 
 TEST_F(OperationDiagnostics, EnumerationIsFramedAndNamesItsClass)
 {

@@ -69,6 +69,13 @@ CMPIStatus ok()
     return {CMPI_RC_OK, nullptr};
 }
 
+/** Keeps @p call in the provider's record and answers OK. */
+CMPIStatus recorded(const FilterCall& call)
+{
+    provider.calls.push_back(call);
+    return ok();
+}
+
 CMPIStatus cleanup(CMPIIndicationMI*, const CMPIContext*, CMPIBoolean)
 {
     return ok();
@@ -78,36 +85,31 @@ CMPIStatus authorize(CMPIIndicationMI*, const CMPIContext*,
                      const CMPISelectExp* filter, const char* className,
                      const CMPIObjectPath* path, const char* owner)
 {
-    provider.calls.push_back(describe("authorizeFilter", filter, className,
-                                      path, std::string(owner) == "root"));
-    return ok();
+    return recorded(describe("authorizeFilter", filter, className, path,
+                             std::string(owner) == "root"));
 }
 
 CMPIStatus mustPoll(CMPIIndicationMI*, const CMPIContext*,
                     const CMPISelectExp* filter, const char* className,
                     const CMPIObjectPath* path)
 {
-    provider.calls.push_back(
-        describe("mustPoll", filter, className, path, false));
-    return ok();
+    return recorded(describe("mustPoll", filter, className, path, false));
 }
 
 CMPIStatus activate(CMPIIndicationMI*, const CMPIContext*,
                     const CMPISelectExp* filter, const char* className,
                     const CMPIObjectPath* path, CMPIBoolean first)
 {
-    provider.calls.push_back(
+    return recorded(
         describe("activateFilter", filter, className, path, first != 0));
-    return ok();
 }
 
 CMPIStatus deactivate(CMPIIndicationMI*, const CMPIContext*,
                       const CMPISelectExp* filter, const char* className,
                       const CMPIObjectPath* path, CMPIBoolean last)
 {
-    provider.calls.push_back(
+    return recorded(
         describe("deActivateFilter", filter, className, path, last != 0));
-    return ok();
 }
 
 CMPIStatus enable(CMPIIndicationMI*, const CMPIContext*)

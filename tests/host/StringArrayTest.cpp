@@ -8,6 +8,13 @@ namespace
 using StringTest = BrokerTest;
 using ArrayTest = BrokerTest;
 
+/** Sets element @p index of @p array to @p value as @p type; gives the rc. */
+CMPIrc setAt(CMPIArray* array, CMPICount index, const CMPIValue& value,
+             CMPIType type)
+{
+    return array->ft->setElementAt(array, index, &value, type).rc;
+}
+
 TEST_F(StringTest, KeepsACopyOfTheText)
 {
     char buffer[] = "hello";
@@ -114,12 +121,9 @@ TEST_F(ArrayTest, CharsArrayIsStoredAsStringArray)
 TEST_F(ArrayTest, WrongElementTypeIsATypeMismatch)
 {
     CMPIArray* a = eft()->newArray(mb(), 1, CMPI_uint16, nullptr);
-    CMPIValue v{};
-    v.uint32 = 5;
-    EXPECT_EQ(a->ft->setElementAt(a, 0, &v, CMPI_uint32).rc,
-              CMPI_RC_ERR_TYPE_MISMATCH);
-    EXPECT_EQ(a->ft->setElementAt(a, 0, &v, CMPI_uint16A).rc,
-              CMPI_RC_ERR_TYPE_MISMATCH);
+    const CMPIValue v{.uint32 = 5};
+    EXPECT_EQ(setAt(a, 0, v, CMPI_uint32), CMPI_RC_ERR_TYPE_MISMATCH);
+    EXPECT_EQ(setAt(a, 0, v, CMPI_uint16A), CMPI_RC_ERR_TYPE_MISMATCH);
     EXPECT_EQ(a->ft
                   ->setElementAt(a, 0, reinterpret_cast<const CMPIValue*>("x"),
                                  CMPI_chars)
@@ -131,9 +135,7 @@ TEST_F(ArrayTest, WrongElementTypeIsATypeMismatch)
 TEST_F(ArrayTest, IndexOutOfRange)
 {
     CMPIArray* a = eft()->newArray(mb(), 2, CMPI_uint8, nullptr);
-    CMPIValue v{};
-    v.uint8 = 1;
-    EXPECT_EQ(a->ft->setElementAt(a, 2, &v, CMPI_uint8).rc,
+    EXPECT_EQ(setAt(a, 2, CMPIValue{.uint8 = 1}, CMPI_uint8),
               CMPI_RC_ERR_NO_SUCH_PROPERTY);
     CMPIStatus rc{CMPI_RC_OK, nullptr};
     const CMPIData d = a->ft->getElementAt(a, 99, &rc);

@@ -546,34 +546,18 @@ std::vector<Case> cases()
 }
 
 /** The provider on three entries, with every diagnostic line captured. */
-class CapturingProviderTest : public entry::ProviderTest
+class CapturingThreeEntries : public entry::CapturingProviderTest
 {
   protected:
     void SetUp() override
     {
-        ProviderTest::SetUp();
+        CapturingProviderTest::SetUp();
         install(entry::selTree(entryCount));
-        capture_ = std::make_shared<CVLog::CaptureSink>();
-        previous_ = CVLog::CVLogger::settings();
-        CVLog::CVLogger::setSink(capture_);
-        CVLog::LoggerSettings all;
-        all.logLevel = 1;
-        all.traceLevel = 1;
-        CVLog::CVLogger::configure(all);
     }
-    void TearDown() override
-    {
-        CVLog::CVLogger::configure(previous_);
-        CVLog::CVLogger::setSink(nullptr);
-        ProviderTest::TearDown();
-    }
-
-    std::shared_ptr<CVLog::CaptureSink> capture_;
-    CVLog::LoggerSettings previous_;
 };
 
 class HostileInput :
-    public CapturingProviderTest,
+    public CapturingThreeEntries,
     public ::testing::WithParamInterface<Case>
 {
 };
@@ -628,7 +612,7 @@ INSTANTIATE_TEST_SUITE_P(Table, HostileInput, ::testing::ValuesIn(cases()),
 namespace
 {
 
-class HostileNames : public CapturingProviderTest
+class HostileNames : public CapturingThreeEntries
 {
   protected:
     /** The captured line that starts with @p prefix, or an empty text. */

@@ -16,6 +16,24 @@ namespace
 using namespace QX::Ipmi;
 using ::testing::HasSubstr;
 
+/** Asks @p session for the SEL info once, expecting an error of
+ *  @p category; gives how long the attempt took. */
+std::chrono::steady_clock::duration failedSelInfo(IpmiSession& session,
+                                                  ErrorCategory category)
+{
+    const auto began = std::chrono::steady_clock::now();
+    try
+    {
+        session.getSelInfo();
+        ADD_FAILURE() << "no error";
+    }
+    catch (const IpmiError& error)
+    {
+        EXPECT_EQ(error.category(), category) << error.what();
+    }
+    return std::chrono::steady_clock::now() - began;
+}
+
 class SessionTest : public ::testing::Test
 {
   protected:
@@ -142,17 +160,7 @@ TEST_F(SessionTest, FrozenBmcIsATimeoutWithinTheTimeoutAndThenRecovers)
     IpmiSession session(parameters(1000));
     session.getSelInfo();
     bmc->freeze();
-    const auto began = std::chrono::steady_clock::now();
-    try
-    {
-        session.getSelInfo();
-        ADD_FAILURE() << "no error";
-    }
-    catch (const IpmiError& error)
-    {
-        EXPECT_EQ(error.category(), ErrorCategory::Timeout) << error.what();
-    }
-    EXPECT_LT(std::chrono::steady_clock::now() - began,
+    EXPECT_LT(failedSelInfo(session, ErrorCategory::Timeout),
               std::chrono::milliseconds(2000));
     bmc->thaw();
     EXPECT_EQ(session.getSelInfo().entries, 0u);
@@ -169,28 +177,10 @@ TEST_F(SessionTest, GuardedExchangeGivesUpAtItsOwnTimeout)
     EXPECT_EQ(session.getSelInfo().entries, 0u);
 
     bmc->freeze();
-    const auto began = std::chrono::steady_clock::now();
-    try
-    {
-        session.getSelInfo();
-        ADD_FAILURE() << "no error";
-    }
-    catch (const IpmiError& error)
-    {
-        EXPECT_EQ(error.category(), ErrorCategory::Timeout) << error.what();
-    }
-    EXPECT_LT(std::chrono::steady_clock::now() - began,
+    EXPECT_LT(failedSelInfo(session, ErrorCategory::Timeout),
               std::chrono::milliseconds(1500));
     // The helper is still inside FreeIPMI: no second exchange meanwhile.
-    try
-    {
-        session.getSelInfo();
-        ADD_FAILURE() << "no error";
-    }
-    catch (const IpmiError& error)
-    {
-        EXPECT_EQ(error.category(), ErrorCategory::Busy) << error.what();
-    }
+    failedSelInfo(session, ErrorCategory::Busy);
 
     bmc->thaw();
     bool served = false;

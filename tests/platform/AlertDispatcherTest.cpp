@@ -115,17 +115,22 @@ void blockUntilOpened(unsigned, DateTime, std::string, const void*)
     gate->finished = true;
 }
 
+/** Starts a watchdog watch whose callback blocks in @p local, raises an
+ *  alert and waits until the callback is inside; false when it never is. */
+bool holdACallbackIn(Gate& local, MemorySource& source)
+{
+    gate = &local;
+    source.startMonitoring(Watchdog, &blockUntilOpened, nullptr);
+    source.raiseAlert("/bmc0/wdt", DateTime());
+    std::unique_lock lock(local.mutex);
+    return local.changed.wait_for(lock, patience,
+                                  [&] { return local.entered; });
+}
+
 TEST_F(AlertDispatcherTest, StopWaitsForTheRunningCallback)
 {
     Gate local;
-    gate = &local;
-    source->startMonitoring(Watchdog, &blockUntilOpened, nullptr);
-    source->raiseAlert("/bmc0/wdt", DateTime());
-    {
-        std::unique_lock lock(local.mutex);
-        ASSERT_TRUE(local.changed.wait_for(lock, patience,
-                                           [&] { return local.entered; }));
-    }
+    ASSERT_TRUE(holdACallbackIn(local, *source));
     std::atomic<bool> stopped{false};
     bool finishedWhenStopped = false;
     std::thread stopper(
@@ -151,14 +156,7 @@ TEST_F(AlertDispatcherTest, StopWaitsForTheRunningCallback)
 TEST_F(AlertDispatcherTest, DestroyingTheSourceWaitsForItsCallback)
 {
     Gate local;
-    gate = &local;
-    source->startMonitoring(Watchdog, &blockUntilOpened, nullptr);
-    source->raiseAlert("/bmc0/wdt", DateTime());
-    {
-        std::unique_lock lock(local.mutex);
-        ASSERT_TRUE(local.changed.wait_for(lock, patience,
-                                           [&] { return local.entered; }));
-    }
+    ASSERT_TRUE(holdACallbackIn(local, *source));
     std::thread opener(
         [&]
         {

@@ -2,22 +2,32 @@
 
 #include "platform/EnvironmentGuard.h"
 
+#include <array>
 #include <ctime>
 
 #include <gtest/gtest.h>
 
 using QX::DateTime;
 
+namespace
+{
+
+using Fields = std::array<unsigned, 7>;
+
+/** Year, month, day, hour, minute, second and millisecond of @p value. */
+Fields fieldsOf(const DateTime& value)
+{
+    return {value.getYear(),       value.getMonth(),  value.getDay(),
+            value.getHour(),       value.getMinute(), value.getSecond(),
+            value.getMillisecond()};
+}
+
+} // namespace
+
 TEST(DateTime, DefaultIsTheEpoch)
 {
     const DateTime epoch;
-    EXPECT_EQ(epoch.getYear(), 1970u);
-    EXPECT_EQ(epoch.getMonth(), 1u);
-    EXPECT_EQ(epoch.getDay(), 1u);
-    EXPECT_EQ(epoch.getHour(), 0u);
-    EXPECT_EQ(epoch.getMinute(), 0u);
-    EXPECT_EQ(epoch.getSecond(), 0u);
-    EXPECT_EQ(epoch.getMillisecond(), 0u);
+    EXPECT_EQ(fieldsOf(epoch), (Fields{1970, 1, 1, 0, 0, 0, 0}));
     EXPECT_EQ(epoch.getOffset(), 0);
     EXPECT_EQ(epoch, DateTime(std::time_t{0}, DateTime::Utc));
 }
@@ -25,13 +35,7 @@ TEST(DateTime, DefaultIsTheEpoch)
 TEST(DateTime, FieldConstructorStoresValuesUnchanged)
 {
     const DateTime value(2024, 13, 40, 25, 61, 62, 999, -5);
-    EXPECT_EQ(value.getYear(), 2024u);
-    EXPECT_EQ(value.getMonth(), 13u);
-    EXPECT_EQ(value.getDay(), 40u);
-    EXPECT_EQ(value.getHour(), 25u);
-    EXPECT_EQ(value.getMinute(), 61u);
-    EXPECT_EQ(value.getSecond(), 62u);
-    EXPECT_EQ(value.getMillisecond(), 999u);
+    EXPECT_EQ(fieldsOf(value), (Fields{2024, 13, 40, 25, 61, 62, 999}));
     EXPECT_EQ(value.getOffset(), -5);
     EXPECT_NE(value, DateTime(2024, 13, 40, 25, 61, 62, 999, -4));
 }

@@ -1,6 +1,7 @@
 #include "CVLogger.h"
 #include "Platform.h"
 #include "ipmi/IpmiSourceFactory.h"
+#include "platform/ConfigurationFiles.h"
 
 #include <cstdio>
 #include <fstream>
@@ -11,6 +12,8 @@
 #include <gtest/gtest.h>
 
 using namespace QX;
+using QX::test::configurationError;
+using QX::test::TempFile;
 using ::testing::HasSubstr;
 using ::testing::Not;
 
@@ -18,36 +21,6 @@ namespace
 {
 
 constexpr const char* secret = "s3cr3t-pw";
-
-/** A file with @p text and @p mode, removed at the end of the test. */
-class ModeFile
-{
-  public:
-    ModeFile(const std::string& text, mode_t mode)
-    {
-        char name[] = "/tmp/qx-ipmi-settings-XXXXXX";
-        const int fd = mkstemp(name);
-        if (fd < 0)
-        {
-            throw std::runtime_error("mkstemp failed");
-        }
-        close(fd);
-        path_ = name;
-        std::ofstream(path_) << text;
-        chmod(path_.c_str(), mode);
-    }
-    ~ModeFile()
-    {
-        std::remove(path_.c_str());
-    }
-    const std::string& path() const
-    {
-        return path_;
-    }
-
-  private:
-    std::string path_;
-};
 
 std::string refusal(const std::string& configurationText,
                     const std::string& file)
@@ -136,49 +109,25 @@ TEST_F(IpmiSettingsTest, EveryKeyIsParsed)
 
 TEST_F(IpmiSettingsTest, BadValuesNameTheKey)
 {
-    const auto error = [](const std::string& text)
-    {
-        try
-        {
-            Platform::parseConfiguration(text, "platform.conf");
-        }
-        catch (const std::runtime_error& failure)
-        {
-            return std::string(failure.what());
-        }
-        return std::string();
-    };
-    EXPECT_EQ(error("ipmi.interface = serial\n"),
+    EXPECT_EQ(configurationError("ipmi.interface = serial\n"),
               "platform.conf:1: ipmi.interface must be inband or lan, not "
               "\"serial\"");
-    EXPECT_THAT(error("ipmi.timeout = 5s\n"),
+    EXPECT_THAT(configurationError("ipmi.timeout = 5s\n"),
                 HasSubstr("ipmi.timeout must be a whole number"));
-    EXPECT_THAT(error("ipmi.poll-interval = 10\n"),
+    EXPECT_THAT(configurationError("ipmi.poll-interval = 10\n"),
                 HasSubstr("ipmi.poll-interval must be a whole number from 50"));
-    EXPECT_EQ(error("ipmi.workarounds = nosuch\n"),
+    EXPECT_EQ(configurationError("ipmi.workarounds = nosuch\n"),
               "platform.conf:1: ipmi.workarounds: unknown workaround "
               "\"nosuch\"");
-    EXPECT_EQ(error("ipmi.colour = blue\n"),
+    EXPECT_EQ(configurationError("ipmi.colour = blue\n"),
               "platform.conf:1: unknown key \"ipmi.colour\"");
 }
 
 TEST_F(IpmiSettingsTest, PasswordNeverAppearsInErrors)
 {
-    const auto error = [](const std::string& text)
-    {
-        try
-        {
-            Platform::parseConfiguration(text, "platform.conf");
-        }
-        catch (const std::runtime_error& failure)
-        {
-            return std::string(failure.what());
-        }
-        return std::string();
-    };
-    EXPECT_EQ(error("ipmi.password = 123456789012345678901\n"),
+    EXPECT_EQ(configurationError("ipmi.password = 123456789012345678901\n"),
               "platform.conf:1: ipmi.password is longer than 20 bytes");
-    EXPECT_EQ(error(std::string("ipmi.password ") + secret + "\n"),
+    EXPECT_EQ(configurationError(std::string("ipmi.password ") + secret + "\n"),
               "platform.conf:1: expected key = value");
 }
 
@@ -189,7 +138,7 @@ TEST_F(IpmiSettingsTest, ConfigurationWithAPasswordMustBePrivate)
                                          "ipmi.host = 127.0.0.1:1\n"
                                          "ipmi.password = ") +
                              secret + "\n";
-    const ModeFile readable(text, 0644);
+    const TempFile readable(text, 0644);
     const std::string why = refusal(text, readable.path());
     EXPECT_THAT(why, HasSubstr("holds an IPMI password but group or others "
                                "may read it (mode 0644): refused"));
@@ -197,14 +146,14 @@ TEST_F(IpmiSettingsTest, ConfigurationWithAPasswordMustBePrivate)
     EXPECT_THAT(logged(), HasSubstr("IPMI instrumentation refused"));
     EXPECT_THAT(logged(), Not(HasSubstr(secret)));
 
-    const ModeFile private_(text, 0600);
+    const TempFile private_(text, 0600);
     EXPECT_EQ(refusal(text, private_.path()), "");
     EXPECT_THAT(logged(), Not(HasSubstr(secret)));
 }
 
 TEST_F(IpmiSettingsTest, PasswordFileMustBePrivate)
 {
-    const ModeFile password(std::string(secret) + "\n", 0640);
+    const TempFile password(std::string(secret) + "\n", 0640);
     const std::string text = "source = ipmi\n"
                              "ipmi.interface = lan\n"
                              "ipmi.host = 127.0.0.1:1\n"

@@ -4,6 +4,7 @@
 #include "Instrumentation.h"
 #include "MemorySource.h"
 #include "Resources.h"
+#include "platform/ConfigurationFiles.h"
 #include "platform/EnvironmentGuard.h"
 #include "platform/TestTrees.h"
 
@@ -16,53 +17,13 @@
 
 using namespace QX;
 using namespace QX::NodeLexicon;
+using QX::test::configurationError;
+using QX::test::TempFile;
 using ::testing::HasSubstr;
 using ::testing::StartsWith;
 
 namespace
 {
-
-std::string configurationError(const std::string& text)
-{
-    try
-    {
-        Platform::parseConfiguration(text, "platform.conf");
-    }
-    catch (const std::runtime_error& error)
-    {
-        return error.what();
-    }
-    return "";
-}
-
-/** A file in the temporary directory, removed at the end of the test. */
-class TempFile
-{
-  public:
-    explicit TempFile(const std::string& text)
-    {
-        char name[] = "/tmp/qx-platform-test-XXXXXX";
-        const int fd = mkstemp(name);
-        if (fd < 0)
-        {
-            throw std::runtime_error("mkstemp failed");
-        }
-        close(fd);
-        path_ = name;
-        std::ofstream(path_) << text;
-    }
-    ~TempFile()
-    {
-        std::remove(path_.c_str());
-    }
-    const std::string& path() const
-    {
-        return path_;
-    }
-
-  private:
-    std::string path_;
-};
 
 /** Restores the configured source and the logger after a test. */
 class PlatformTest : public ::testing::Test

@@ -133,6 +133,20 @@ class Registry : public testsupport::PlatformTest
         PlatformTest::TearDown();
     }
 
+    /** Every start (or, with @p start false, every stop) of a watch went
+     *  to the log alert handler, without a context. */
+    void expectLogHandlerOnEvery(bool start) const
+    {
+        for (const auto& call : counting->calls())
+        {
+            if (call.start == start)
+            {
+                EXPECT_EQ(call.callback, &LogAlertHandler);
+                EXPECT_EQ(call.context, nullptr);
+            }
+        }
+    }
+
     static void resetState()
     {
         for (auto* counter : {&subscriberCountServerIndication,
@@ -187,14 +201,7 @@ TEST_F(Registry, LogFullAndLogClearShareOneWatchWhicheverComesFirst)
     subscribeForSELIndication(3);
     subscribeForSELIndication(5);
     EXPECT_EQ(counting->count(true, EventLog), 2u);
-    for (const auto& call : counting->calls())
-    {
-        if (call.start)
-        {
-            EXPECT_EQ(call.callback, &LogAlertHandler);
-            EXPECT_EQ(call.context, nullptr);
-        }
-    }
+    expectLogHandlerOnEvery(true);
 }
 
 TEST_F(Registry, EachClassStartsItsWatchWithItsHandler)
@@ -281,14 +288,7 @@ TEST_F(Registry, DisableTakesOnlyTheLogFullCounterDown)
     disableSELIndication();
     EXPECT_EQ(counting->count(false, EventLog), 2u);
     EXPECT_EQ(subscriberCountLogFullIndication, 4294967294u);
-    for (const auto& call : counting->calls())
-    {
-        if (!call.start)
-        {
-            EXPECT_EQ(call.callback, &LogAlertHandler);
-            EXPECT_EQ(call.context, nullptr);
-        }
-    }
+    expectLogHandlerOnEvery(false);
 }
 
 TEST_F(Registry, OnlyTheLogClearCounterIsTraced)

@@ -1,5 +1,7 @@
 #include "TestSupport.h"
 
+#include "CapturedLines.h"
+
 namespace testsupport
 {
 
@@ -68,15 +70,7 @@ std::vector<CVLog::LogRecord> PlatformTest::logRecords() const
 std::vector<CVLog::LogRecord>
 PlatformTest::recordsContaining(const std::string& text) const
 {
-    std::vector<CVLog::LogRecord> found;
-    for (const auto& record : capture->records())
-    {
-        if (record.message.find(text) != std::string::npos)
-        {
-            found.push_back(record);
-        }
-    }
-    return found;
+    return testsupport::recordsContaining(*capture, text);
 }
 
 } // namespace testsupport

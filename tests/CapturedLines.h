@@ -1,0 +1,28 @@
+#pragma once
+
+// Reading the diagnostic lines a test captured.
+
+#include "CVLogger.h"
+
+#include <string>
+#include <vector>
+
+namespace testsupport
+{
+
+/** The captured records whose message contains @p text, in order. */
+inline std::vector<CVLog::LogRecord>
+recordsContaining(const CVLog::CaptureSink& capture, const std::string& text)
+{
+    std::vector<CVLog::LogRecord> found;
+    for (const auto& record : capture.records())
+    {
+        if (record.message.find(text) != std::string::npos)
+        {
+            found.push_back(record);
+        }
+    }
+    return found;
+}
+
+} // namespace testsupport
