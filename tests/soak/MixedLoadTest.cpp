@@ -85,7 +85,7 @@ class MixedLoad : public ::testing::Test
     void SetUp() override
     {
         CVLog::CVLogger::setSink(nullptr);
-        threadsBefore = threadCount();
+        threadsBefore = threadBaseline();
         source = std::make_shared<QX::MemorySource>(entry::selTree(20).build());
         QX::Platform::overrideSource(source);
     }

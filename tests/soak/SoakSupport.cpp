@@ -20,6 +20,12 @@ std::size_t threadCount()
     return count;
 }
 
+std::size_t threadBaseline()
+{
+    std::thread([] {}).join();
+    return threadCount();
+}
+
 std::size_t awaitThreadCount(std::size_t count)
 {
     const auto deadline = std::chrono::steady_clock::now() + patience;

@@ -22,6 +22,10 @@ constexpr std::chrono::seconds patience{30};
 /** Threads of this process now (entries of /proc/self/task). */
 std::size_t threadCount();
 
+/** threadCount() once a thread has been started and joined: the thread
+ *  sanitizer starts a thread of its own with the process's second one. */
+std::size_t threadBaseline();
+
 /** Waits until the process has at most @p count threads (threads that
  *  ended may still be on their way out); the count reached. */
 std::size_t awaitThreadCount(std::size_t count);

@@ -23,7 +23,7 @@ class Unload : public ::testing::Test
     void SetUp() override
     {
         CVLog::CVLogger::setSink(nullptr);
-        threadsBefore = threadCount();
+        threadsBefore = threadBaseline();
         source = std::make_shared<QX::MemorySource>(entry::selTree(5).build());
         QX::Platform::overrideSource(source);
     }
