@@ -404,6 +404,7 @@ TEST_F(MixedLoad, RequestsAlertsAndSubscriptionsAtOnce)
         host::Host host(SELPROV_LIBRARY);
         host::IndicationInbox inbox = host.listen(nameSpace);
         std::vector<std::thread> threads;
+        threads.reserve(requestThreads + 2);
         for (unsigned t = 0; t < requestThreads; ++t)
         {
             threads.emplace_back([this, &host, t] { runRequests(host, t); });
