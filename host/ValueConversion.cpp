@@ -33,6 +33,8 @@ CMPIrc readScalar(const CMPIValue& v, CMPIType type, Value& out)
             out.u = v.uint64;
             return CMPI_RC_OK;
         case CMPI_sint8:
+            // A signed number, not a character.
+            // NOLINTNEXTLINE(bugprone-signed-char-misuse,cert-str34-c)
             out.s = v.sint8;
             return CMPI_RC_OK;
         case CMPI_sint16:

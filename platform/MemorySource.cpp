@@ -160,7 +160,7 @@ std::string MemorySource::appendEntry(const std::string& logPath,
                                       const std::string& recordData,
                                       const std::string& description)
 {
-    const std::string path = entryPath(logPath, recordId);
+    std::string path = entryPath(logPath, recordId);
     {
         const std::lock_guard lock(mutex_);
         const auto log = tree_->find(logPath);

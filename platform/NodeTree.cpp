@@ -184,8 +184,9 @@ NodeTreeBuilder& NodeTreeBuilder::removeNodes(NodeLexicon::NodeType kind,
         {
             continue;
         }
-        under[i] = parent == ancestor || under[parent];
-        removed[i] = (under[i] && nodes_[i].kind == kind) || removed[parent];
+        under[i] = static_cast<char>(parent == ancestor || under[parent]);
+        removed[i] = static_cast<char>((under[i] && nodes_[i].kind == kind) ||
+                                       removed[parent]);
     }
 
     std::vector<NodeTree::NodeId> newId(count, NodeTree::none);

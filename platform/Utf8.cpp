@@ -10,6 +10,8 @@ namespace
 
 void appendUtf8(std::string& out, wchar_t character)
 {
+    // A wchar_t, not a char: negative values land above 0x10FFFF.
+    // NOLINTNEXTLINE(bugprone-signed-char-misuse,cert-str34-c)
     auto code = static_cast<std::uint32_t>(character);
     if ((code >= 0xD800 && code <= 0xDFFF) || code > 0x10FFFF)
     {

@@ -229,7 +229,7 @@ Options parseCommandLine(const std::vector<std::string>& args)
     Options o;
     Reader in(args);
     std::optional<std::string> nameSpace;
-    while (!in.done() && in.peek().rfind("-", 0) == 0)
+    while (!in.done() && in.peek().rfind('-', 0) == 0)
     {
         if (auto v = in.option("--library"))
         {

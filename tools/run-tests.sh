@@ -1,7 +1,7 @@
 #!/usr/bin/env bash
 # Builds and runs every test: the plain build (warnings as errors, format
-# check), then the ASan+UBSan build and the TSan build, then each fuzz
-# target for a bounded time (FUZZ_SECONDS, default 30).
+# check, clang-tidy), then the ASan+UBSan build and the TSan build, then
+# each fuzz target for a bounded time (FUZZ_SECONDS, default 30).
 set -euo pipefail
 cd "$(dirname "$0")/.."
 
@@ -22,6 +22,8 @@ for preset in default asan tsan; do
     echo "== $preset tests"
     ctest --preset "$preset" -j 2
     if [[ $preset == default ]]; then
+        echo "== clang-tidy"
+        tools/run-clang-tidy.sh build
         echo "== package"
         tools/check-package.sh build
     fi

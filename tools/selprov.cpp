@@ -46,9 +46,9 @@ std::string defaultLibrary()
 {
     const std::string installed = SELPROV_INSTALLED_LIBRARY;
     const std::string dir = executableDirectory();
-    const std::string installedPath =
-        !installed.empty() && installed.front() == '/' ? installed
-                                                       : dir + "/" + installed;
+    std::string installedPath = !installed.empty() && installed.front() == '/'
+                                    ? installed
+                                    : dir + "/" + installed;
     const std::string buildTreePath = dir + "/../lib/libSELProvider.so";
     for (const std::string& candidate : {installedPath, buildTreePath})
     {
@@ -182,7 +182,7 @@ host::Outcome run(const selprov::Options& o, host::Host& h)
         case Command::ClearLog:
         {
             const host::ObjectPath logClass = classPath(o, "ZAN_MgmtHwLog");
-            const host::Outcome names = h.enumerateInstanceNames(logClass);
+            host::Outcome names = h.enumerateInstanceNames(logClass);
             if (names.rc != CMPI_RC_OK)
             {
                 return names;
@@ -258,7 +258,7 @@ int runBatch(const selprov::Options& batch, host::Host& h)
             std::vector<std::string> args = batch.globalArgs;
             const std::vector<std::string> words =
                 selprov::splitBatchLine(line);
-            if (words.empty() || words.front().rfind("#", 0) == 0)
+            if (words.empty() || words.front().rfind('#', 0) == 0)
             {
                 continue;
             }

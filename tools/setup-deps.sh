@@ -10,7 +10,7 @@ packages=(cmake ninja-build g++ pkg-config googletest libgtest-dev
           libgmock-dev libbenchmark-dev clang-format
           dpkg-dev file lintian
           libfreeipmi-dev freeipmi-tools openipmi ipmitool libopenipmi-dev
-          clang-14 libclang-rt-14-dev)
+          clang-14 libclang-rt-14-dev clang-tidy-14)
 
 missing=()
 for package in "${packages[@]}"; do

@@ -154,6 +154,22 @@ bool FreeIpmiDescriber::openOrBuildCache(IpmiContext& context)
     return true;
 }
 
+bool FreeIpmiDescriber::openCacheFile(const std::string& file)
+{
+    if (named_)
+    {
+        named_.reset();
+        ipmi_sdr_cache_close(sdr_.get());
+    }
+    if (ipmi_sdr_cache_open(sdr_.get(), nullptr, file.c_str()) < 0)
+    {
+        return false;
+    }
+    named_.emplace(sdr_.get());
+    setFlags(*named_, selFlags_);
+    return true;
+}
+
 std::string FreeIpmiDescriber::describe(const SelRecordBytes& record)
 {
     const std::uint8_t type = recordTypeOf(record);

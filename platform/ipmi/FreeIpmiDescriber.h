@@ -34,6 +34,15 @@ class FreeIpmiDescriber : public RecordDescriber
     bool refreshSensorNames() override;
     std::string describe(const SelRecordBytes& record) override;
 
+    /**
+     * Names sensors from the SDR cache file @p file as it stands, without
+     * asking the BMC whether it is current: for records read elsewhere,
+     * with the cache of the BMC they came from. Lasts until the next
+     * refreshSensorNames. False (sensors named by number) when the file
+     * cannot be opened.
+     */
+    bool openCacheFile(const std::string& file);
+
   private:
     bool openOrBuildCache(IpmiContext& context);
     std::string cacheFile() const;

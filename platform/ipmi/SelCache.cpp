@@ -48,8 +48,10 @@ SelChange SelCache::refresh(BmcCommands& bmc, RecordDescriber& describer)
     sessionGeneration_ = bmc.sessionGeneration();
 
     SelChange change = SelChange::Replaced;
+    // The first and the last branch both read everything, for different
+    // reasons.
     if (!trusted_)
-    {
+    { // NOLINT(bugprone-branch-clone)
         readAll(bmc, info, describer);
     }
     else if (info.sameRecordsAs(info_))

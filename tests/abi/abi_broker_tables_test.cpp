@@ -170,8 +170,7 @@ CMPI_ASSERT_MEMBER(CMPIBrokerExtFT, joinThread, 24, int (*)(void*, void**));
 CMPI_ASSERT_MEMBER(CMPIBrokerExtFT, exitThread, 32, int (*)(void*));
 CMPI_ASSERT_MEMBER(CMPIBrokerExtFT, cancelThread, 40, int (*)(void*));
 CMPI_ASSERT_MEMBER(CMPIBrokerExtFT, threadSleep, 48, int (*)(CMPIUint32));
-CMPI_ASSERT_MEMBER(CMPIBrokerExtFT, threadOnce, 56,
-                   int (*)(int*, void (*)(void)));
+CMPI_ASSERT_MEMBER(CMPIBrokerExtFT, threadOnce, 56, int (*)(int*, void (*)()));
 CMPI_ASSERT_MEMBER(CMPIBrokerExtFT, createThreadKey, 64,
                    int (*)(unsigned int*, void (*)(void*)));
 CMPI_ASSERT_MEMBER(CMPIBrokerExtFT, destroyThreadKey, 72,

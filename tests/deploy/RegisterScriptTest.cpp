@@ -207,6 +207,8 @@ class RegisterScript : public ::testing::Test
             "/tools/selprovider-register --data-dir " + data() + " " +
             arguments + " 2>" + (root_ / "stderr").string();
         ScriptRun result;
+        // The script runs through the shell, as an administrator runs it.
+        // NOLINTNEXTLINE(cert-env33-c)
         FILE* pipe = ::popen(("timeout 60 " + command).c_str(), "r");
         if (pipe == nullptr)
         {

@@ -121,6 +121,7 @@ TEST_F(IndicationLifetime, EverythingAtOnceFromSeveralThreads)
     const std::vector<std::string> alerting = {
         QX::MemorySource::entryPath("/bmc0/sel", 1),
         QX::MemorySource::entryPath("/bmc0/sel", 2), "/bmc0/sel", "/bmc0/wdt"};
+    threads.reserve(alerting.size() + 3);
     for (const std::string& path : alerting)
     {
         threads.emplace_back(

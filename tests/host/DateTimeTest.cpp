@@ -39,7 +39,7 @@ TEST_F(DateTimeTest, AcceptsInterval)
     ASSERT_NE(d, nullptr);
     EXPECT_TRUE(d->ft->isInterval(d, nullptr));
     EXPECT_EQ(d->ft->getBinaryFormat(d, nullptr),
-              ((86400ull + 2 * 3600 + 3 * 60 + 4) * 1000000ull) + 5);
+              ((86400ull + 2ull * 3600 + 3ull * 60 + 4) * 1000000ull) + 5);
 }
 
 TEST_F(DateTimeTest, RejectsMalformedText)

@@ -120,6 +120,7 @@ TEST_F(FaultTest, SkipAndCount)
 {
     broker_.faults().fail(BrokerCall::NewString, FaultMode::ReturnNull, 2, 2);
     std::vector<bool> failed;
+    failed.reserve(6);
     for (int i = 0; i < 6; ++i)
     {
         failed.push_back(eft()->newString(mb(), "x", nullptr) == nullptr);

@@ -335,6 +335,7 @@ TEST_F(InboxTest, DetachFreesThePreparedContextAndTheThreadsObjects)
 {
     const CMPIBroker* b = mb();
     std::vector<CMPIContext*> prepared;
+    prepared.reserve(100);
     for (int i = 0; i < 100; ++i)
     {
         prepared.push_back(b->bft->prepareAttachThread(b, context()));

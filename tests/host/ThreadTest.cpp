@@ -203,6 +203,7 @@ TEST(ConcurrentRequests, ManyThreadsUseOneBroker)
 {
     host::Broker broker;
     std::vector<std::thread> threads;
+    threads.reserve(8);
     std::atomic<int> failures{0};
     for (int t = 0; t < 8; ++t)
     {

@@ -57,9 +57,11 @@ TEST(WbemText, ParsesTypedValues)
 
 TEST(WbemText, RoundTrips)
 {
-    const char* texts[] = {
+    const char* const logPath =
         "root/zanqx:ZAN_MgmtHwLog.CreationClassName=\"ZAN_MgmtHwLog\","
-        "Name=\"IPMI SEL\"",
+        "Name=\"IPMI SEL\"";
+    const char* texts[] = {
+        logPath,
         "root:C",
         "C.K=1",
         "//host/ns:C.A=\"x,y=z\",B=-1,C=TRUE",

@@ -90,6 +90,8 @@ std::string BmcTest::ipmitool(const std::string& arguments) const
 {
     const std::string command =
         "TZ=UTC " + bmc_->ipmitool() + " " + arguments + " 2>&1";
+    // The shell runs ipmitool as a user would, with its output redirected.
+    // NOLINTNEXTLINE(cert-env33-c)
     FILE* pipe = ::popen(command.c_str(), "r");
     if (pipe == nullptr)
     {

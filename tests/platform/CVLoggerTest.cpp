@@ -154,6 +154,7 @@ TEST_F(LoggerTest, ConcurrentWritersLoseNothing)
 {
     configure(1, 1, {"*"});
     std::vector<std::thread> threads;
+    threads.reserve(4);
     for (int t = 0; t < 4; ++t)
     {
         threads.emplace_back(

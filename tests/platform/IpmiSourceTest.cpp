@@ -37,7 +37,7 @@ class IpmiSourceTest : public ::testing::Test
     }
 
     // The source owns its BMC; the test keeps a pointer to steer it.
-    void make(Settings settings = {})
+    void make(const Settings& settings = {})
     {
         auto fake = std::make_unique<FakeBmc>();
         bmc = fake.get();

@@ -16,6 +16,7 @@ std::vector<std::string> pathsOf(const NodeTree& tree,
                                  const std::vector<NodeTree::NodeId>& ids)
 {
     std::vector<std::string> paths;
+    paths.reserve(ids.size());
     for (const auto id : ids)
     {
         paths.push_back(tree.node(id).path);

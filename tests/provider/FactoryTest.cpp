@@ -172,6 +172,7 @@ class Collection : public PlatformTest
             broker_.makeObjectPath(classPath(className)), className, nullptr,
             false, instances, &status);
         std::vector<host::Instance> copies;
+        copies.reserve(instances.size());
         for (const CMPIInstance* instance : instances)
         {
             copies.push_back(host::Broker::toInstance(instance));

@@ -347,6 +347,7 @@ void SimulatedBmc::launch()
     std::vector<std::string> words{"ipmi_sim", "-c", conf,  "-f",
                                    emu,        "-s", state, "-n"};
     std::vector<char*> argv;
+    argv.reserve(words.size() + 1);
     for (std::string& word : words)
     {
         argv.push_back(word.data());
