@@ -340,8 +340,8 @@ void IpmiSource::startMonitoring(NodeLexicon::NodeType kind,
     const std::lock_guard lock(pollerMutex_);
     if (!poller_.joinable() && dispatcher_.total() > 0)
     {
-        poller_ = std::jthread([this](std::stop_token stop)
-                               { pollLoop(std::move(stop)); });
+        poller_ = std::jthread([this](const std::stop_token& stop)
+                               { pollLoop(stop); });
     }
 }
 
@@ -374,7 +374,7 @@ void IpmiSource::stopPoller(bool evenIfMonitored)
     poller_.join();
 }
 
-void IpmiSource::pollLoop(std::stop_token stop)
+void IpmiSource::pollLoop(const std::stop_token& stop)
 {
     const auto interval = std::chrono::milliseconds(settings_.pollIntervalMs);
     while (!stop.stop_requested())

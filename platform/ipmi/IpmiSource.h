@@ -122,7 +122,7 @@ class IpmiSource : public InstrumentationSource
     void refreshRestartCause(bool selChanged);
     void applyRestartCause();
     void clearSel();
-    void pollLoop(std::stop_token stop);
+    void pollLoop(const std::stop_token& stop);
     void pollOnce();
     void stopPoller(bool evenIfMonitored);
 
