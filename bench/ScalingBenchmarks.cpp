@@ -70,47 +70,59 @@ void measure(benchmark::State& state, std::size_t expected,
         static_cast<double>(after.peakLiveBytes - before.liveBytes) / entries);
 }
 
-void BM_ScalingEnumerateInstances(benchmark::State& state)
+// Runs @p run with a host on a generated log of state.range(0) entries.
+template <typename Run>
+void onGeneratedLog(benchmark::State& state, const Run& run)
 {
     const auto entries = static_cast<unsigned>(state.range(0));
     useGeneratedLog(entries);
     {
         host::Host host(SELPROV_LIBRARY);
-        measure(
-            state, entries,
-            [&]
-            { return host.enumerateInstances(entryClass()).instances.size(); });
+        run(host, entries);
     }
     QX::Platform::overrideSource(nullptr);
 }
 
+void BM_ScalingEnumerateInstances(benchmark::State& state)
+{
+    onGeneratedLog(state,
+                   [&](host::Host& host, unsigned entries)
+                   {
+                       measure(state, entries,
+                               [&] {
+                                   return host.enumerateInstances(entryClass())
+                                       .instances.size();
+                               });
+                   });
+}
+
 void BM_ScalingEnumerateInstanceNames(benchmark::State& state)
 {
-    const auto entries = static_cast<unsigned>(state.range(0));
-    useGeneratedLog(entries);
-    {
-        host::Host host(SELPROV_LIBRARY);
-        measure(
-            state, entries,
-            [&]
-            { return host.enumerateInstanceNames(entryClass()).paths.size(); });
-    }
-    QX::Platform::overrideSource(nullptr);
+    onGeneratedLog(state,
+                   [&](host::Host& host, unsigned entries)
+                   {
+                       measure(state, entries,
+                               [&] {
+                                   return host
+                                       .enumerateInstanceNames(entryClass())
+                                       .paths.size();
+                               });
+                   });
 }
 
 // One entry, from the middle of the log, by its full path.
 void BM_ScalingGetInstance(benchmark::State& state)
 {
-    const auto entries = static_cast<unsigned>(state.range(0));
-    useGeneratedLog(entries);
-    {
-        host::Host host(SELPROV_LIBRARY);
-        const auto names = host.enumerateInstanceNames(entryClass());
-        const host::ObjectPath target = names.paths.at(names.paths.size() / 2);
-        measure(state, 1,
-                [&] { return host.getInstance(target).instances.size(); });
-    }
-    QX::Platform::overrideSource(nullptr);
+    onGeneratedLog(
+        state,
+        [&](host::Host& host, unsigned)
+        {
+            const auto names = host.enumerateInstanceNames(entryClass());
+            const host::ObjectPath target =
+                names.paths.at(names.paths.size() / 2);
+            measure(state, 1,
+                    [&] { return host.getInstance(target).instances.size(); });
+        });
 }
 
 void logSizes(benchmark::internal::Benchmark* b)

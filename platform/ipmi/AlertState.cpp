@@ -18,18 +18,6 @@ namespace
 
 constexpr const char* noRecord = "none";
 
-std::string recordText(const SelRecordBytes& record)
-{
-    std::string text;
-    char pair[3];
-    for (const std::uint8_t byte : record)
-    {
-        std::snprintf(pair, sizeof pair, "%02x", byte);
-        text += pair;
-    }
-    return text;
-}
-
 int hexDigit(char c)
 {
     if (c >= '0' && c <= '9')
@@ -108,12 +96,23 @@ void closeQuietly(int fd)
 
 } // namespace
 
+std::string recordHex(const SelRecordBytes& record)
+{
+    std::string text;
+    char pair[3];
+    for (const std::uint8_t byte : record)
+    {
+        std::snprintf(pair, sizeof pair, "%02x", byte);
+        text += pair;
+    }
+    return text;
+}
+
 std::string formatAlertState(const AnnouncedState& state)
 {
     std::string text = std::string(alertStateHeader) + "\n";
     text += "last-record " +
-            (state.lastRecord ? recordText(*state.lastRecord) : noRecord) +
-            "\n";
+            (state.lastRecord ? recordHex(*state.lastRecord) : noRecord) + "\n";
     text += "last-addition " + std::to_string(state.lastAddition) + "\n";
     text += "last-erase " + std::to_string(state.lastErase) + "\n";
     text += "log-status " + std::to_string(state.logStatus) + "\n";

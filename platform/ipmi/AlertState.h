@@ -29,6 +29,9 @@ struct AnnouncedState
     bool operator==(const AnnouncedState&) const = default;
 };
 
+/** The 32 lower-case hex digits of @p record, as the file keeps it. */
+std::string recordHex(const SelRecordBytes& record);
+
 /** The first line of the file; a file of another version is not used. */
 constexpr const char* alertStateHeader = "qx-sel-alerts 1";
 

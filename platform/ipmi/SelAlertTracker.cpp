@@ -28,18 +28,6 @@ PendingAlert alert(NodeType kind, unsigned code, std::string path)
     return PendingAlert{kind, code, DateTime::now(), std::move(path)};
 }
 
-std::string compactHex(const SelRecordBytes& record)
-{
-    std::string text;
-    char pair[3];
-    for (const std::uint8_t byte : record)
-    {
-        std::snprintf(pair, sizeof pair, "%02x", byte);
-        text += pair;
-    }
-    return text;
-}
-
 bool isFillStatus(unsigned status)
 {
     return status == EventLogStatusAlmostFull || status == EventLogStatusFull;
@@ -65,7 +53,7 @@ SelAlertTracker::restartKeyOf(const std::vector<CachedRecord>& records)
                                          return isWatchdogRestart(record.bytes);
                                      });
     return newest == records.rend() ? restartWithoutRecord
-                                    : compactHex(newest->bytes);
+                                    : recordHex(newest->bytes);
 }
 
 TrackerResult SelAlertTracker::start(const std::optional<AnnouncedState>& kept,
@@ -198,7 +186,7 @@ void SelAlertTracker::announceNew(const SelObservation& now,
         {
             out.push_back(
                 alert(Watchdog, AlertOnWatchdog, IpmiSource::watchdogPath));
-            state_.restartKey = compactHex(record.bytes);
+            state_.restartKey = recordHex(record.bytes);
         }
     }
 }

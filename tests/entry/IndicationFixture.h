@@ -3,6 +3,7 @@
 #include "CVLogger.h"
 #include "DateTime.h"
 #include "EntryFixture.h"
+#include "EventClasses.h"
 #include "IndicationInbox.h"
 
 #include <chrono>
@@ -14,10 +15,7 @@
 namespace entry
 {
 
-constexpr const char* entryEvent = "ZAN_MgmtHwLogEntryEvent";
-constexpr const char* clearEvent = "ZAN_MgmtHwLogClearEvent";
-constexpr const char* fullEvent = "ZAN_MgmtHwLogFullEvent";
-constexpr const char* restartEvent = "ZANx_AutomaticServerRestartEvent";
+using namespace testevents;
 
 /** How long a test waits for something that normally takes milliseconds. */
 constexpr std::chrono::seconds patience{10};

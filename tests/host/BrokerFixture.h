@@ -13,6 +13,12 @@
 namespace hosttest
 {
 
+/** A C string as the CMPIValue of a CMPI_chars argument. */
+inline const CMPIValue* chars(const char* text)
+{
+    return reinterpret_cast<const CMPIValue*>(text);
+}
+
 class BrokerTest : public ::testing::Test
 {
   protected:

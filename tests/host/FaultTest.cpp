@@ -9,11 +9,6 @@ using host::BrokerCall;
 using host::FaultMode;
 using FaultTest = BrokerTest;
 
-const CMPIValue* chars(const char* text)
-{
-    return reinterpret_cast<const CMPIValue*>(text);
-}
-
 // Each object-making call, driven the way a provider drives it.
 struct Maker
 {

@@ -9,11 +9,6 @@ namespace
 
 using InstanceTest = BrokerTest;
 
-const CMPIValue* chars(const char* text)
-{
-    return reinterpret_cast<const CMPIValue*>(text);
-}
-
 TEST_F(InstanceTest, TypedProperties)
 {
     CMPIInstance* i = newInstance("root/zanqx", "ZAN_MgmtHwLogEntry");

@@ -12,11 +12,6 @@ namespace
 
 using ResultStreamTest = BrokerTest;
 
-const CMPIValue* chars(const char* text)
-{
-    return reinterpret_cast<const CMPIValue*>(text);
-}
-
 TEST_F(ResultStreamTest, HandlersReceiveResultsInOrderInsteadOfTheOutcome)
 {
     std::vector<std::string> seen;

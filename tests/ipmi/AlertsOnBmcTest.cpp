@@ -3,7 +3,9 @@
 // OpenIPMI's simulated BMC.
 
 #include "BmcFixture.h"
+#include "EventClasses.h"
 #include "IndicationInbox.h"
+#include "SystemEventRecord.h"
 #include "ipmi/IpmiSource.h"
 
 #include <chrono>
@@ -20,10 +22,7 @@ using bmctest::number;
 using bmctest::text;
 using ::testing::HasSubstr;
 
-constexpr const char* entryEvent = "ZAN_MgmtHwLogEntryEvent";
-constexpr const char* clearEvent = "ZAN_MgmtHwLogClearEvent";
-constexpr const char* fullEvent = "ZAN_MgmtHwLogFullEvent";
-constexpr const char* restartEvent = "ZANx_AutomaticServerRestartEvent";
+using namespace testevents;
 
 // Short enough to keep the suite quick, long enough for the sanitizer
 // builds to keep up.
@@ -36,22 +35,10 @@ constexpr std::chrono::milliseconds quietSpell{6 * pollMs};
 // A temperature event with id @p id and time @p time (the BMC sets both).
 bmcsim::Record temperatureRecord(std::uint16_t id, std::uint32_t time)
 {
-    return {static_cast<std::uint8_t>(id),
-            static_cast<std::uint8_t>(id >> 8),
-            0x02,
-            static_cast<std::uint8_t>(time),
-            static_cast<std::uint8_t>(time >> 8),
-            static_cast<std::uint8_t>(time >> 16),
-            static_cast<std::uint8_t>(time >> 24),
-            0x20,
-            0x00,
-            0x04,
-            0x01,
-            0x30,
-            0x01,
-            0x57,
-            static_cast<std::uint8_t>(0x40 + (id & 0x0F)),
-            0x50};
+    return bmcsim::systemEventRecord(
+        id, time,
+        {0x01, 0x30, 0x01, 0x57, static_cast<std::uint8_t>(0x40 + (id & 0x0F)),
+         0x50});
 }
 
 std::vector<bmcsim::Record> temperatureRecords(unsigned count)
@@ -65,6 +52,11 @@ std::vector<bmcsim::Record> temperatureRecords(unsigned count)
     return records;
 }
 
+std::string recordIdKey(unsigned id)
+{
+    return "RecordID=\"" + std::to_string(id) + "\"";
+}
+
 class AlertsOnBmcTest : public bmctest::BmcTest
 {
   protected:
@@ -73,6 +65,15 @@ class AlertsOnBmcTest : public bmctest::BmcTest
         pollIntervalMs = pollMs;
         start(std::move(options), timeoutMs);
         listen();
+    }
+    /** Starts the simulator with @p count temperature records, then
+     *  subscribes to @p className. */
+    void launchSubscribed(unsigned count, const std::string& className)
+    {
+        bmcsim::Options options;
+        options.records = temperatureRecords(count);
+        launch(options);
+        subscribe(className);
     }
     void reload(unsigned timeoutMs = 2000)
     {
@@ -136,20 +137,34 @@ class AlertsOnBmcTest : public bmctest::BmcTest
         return inbox->takeAll();
     }
 
+    /** One entry event for each of @p ids, in that order, then nothing. */
+    void expectEntryEventsFor(const std::vector<std::uint16_t>& ids)
+    {
+        for (const std::uint16_t id : ids)
+        {
+            const auto indication = next();
+            ASSERT_TRUE(indication.has_value()) << "no event for record " << id;
+            EXPECT_EQ(indication->instance.path.className, entryEvent);
+            EXPECT_THAT(text(indication->instance, "AlertingManagedElement"),
+                        HasSubstr(recordIdKey(id)));
+        }
+        EXPECT_TRUE(more().empty());
+    }
+
+    /** A restart of the object manager announces nothing old. */
+    void expectNothingAfterRestart(const std::string& className)
+    {
+        reload();
+        subscribe(className);
+        EXPECT_TRUE(more().empty());
+    }
+
     std::unique_ptr<host::IndicationInbox> inbox;
 };
 
-std::string recordIdKey(unsigned id)
-{
-    return "RecordID=\"" + std::to_string(id) + "\"";
-}
-
 TEST_F(AlertsOnBmcTest, AddedRecordDeliversItsEntryEvent)
 {
-    bmcsim::Options options;
-    options.records = temperatureRecords(2);
-    launch(options);
-    subscribe(entryEvent);
+    launchSubscribed(2, entryEvent);
 
     const auto ids = bmc().addRecords({temperatureRecord(0, 0)});
     ASSERT_EQ(ids.size(), 1u);
@@ -179,23 +194,12 @@ TEST_F(AlertsOnBmcTest, TenRecordsAtOnceArriveInRecordOrder)
     std::vector<bmcsim::Record> records(10, temperatureRecord(0, 0));
     const auto ids = bmc().addRecords(records);
     ASSERT_EQ(ids.size(), 10u);
-    for (const std::uint16_t id : ids)
-    {
-        const auto indication = next();
-        ASSERT_TRUE(indication.has_value()) << "no event for record " << id;
-        EXPECT_EQ(indication->instance.path.className, entryEvent);
-        EXPECT_THAT(text(indication->instance, "AlertingManagedElement"),
-                    HasSubstr(recordIdKey(id)));
-    }
-    EXPECT_TRUE(more().empty());
+    expectEntryEventsFor(ids);
 }
 
 TEST_F(AlertsOnBmcTest, ClearDeliversOneClearEvent)
 {
-    bmcsim::Options options;
-    options.records = temperatureRecords(3);
-    launch(options);
-    subscribe(clearEvent);
+    launchSubscribed(3, clearEvent);
 
     bmc().clearSel();
     const auto indication = next();
@@ -260,9 +264,7 @@ TEST_F(AlertsOnBmcTest, WatchdogExpiryDeliversOneRestartEventAcrossRestarts)
 
     // The BMC still says "watchdog" after a restart of the object
     // manager: that restart was announced already.
-    reload();
-    subscribe(restartEvent);
-    EXPECT_TRUE(more().empty());
+    expectNothingAfterRestart(restartEvent);
 }
 
 TEST_F(AlertsOnBmcTest, RestartCauseWithoutRecordIsAnnouncedOnceAtStart)
@@ -289,17 +291,12 @@ TEST_F(AlertsOnBmcTest, RestartCauseWithoutRecordIsAnnouncedOnceAtStart)
     EXPECT_EQ(number(indication->instance, "PerceivedSeverity"), 4u);
     EXPECT_TRUE(more().empty());
 
-    reload();
-    subscribe(restartEvent);
-    EXPECT_TRUE(more().empty());
+    expectNothingAfterRestart(restartEvent);
 }
 
 TEST_F(AlertsOnBmcTest, RecordsAddedWhileUnloadedArriveOnceAfterReload)
 {
-    bmcsim::Options options;
-    options.records = temperatureRecords(2);
-    launch(options);
-    subscribe(entryEvent);
+    launchSubscribed(2, entryEvent);
     reload(); // unloaded
 
     const auto ids =
@@ -307,27 +304,15 @@ TEST_F(AlertsOnBmcTest, RecordsAddedWhileUnloadedArriveOnceAfterReload)
                           temperatureRecord(0, 0)});
     ASSERT_EQ(ids.size(), 3u);
     subscribe(entryEvent);
-    for (const std::uint16_t id : ids)
-    {
-        const auto indication = next();
-        ASSERT_TRUE(indication.has_value()) << "no event for record " << id;
-        EXPECT_THAT(text(indication->instance, "AlertingManagedElement"),
-                    HasSubstr(recordIdKey(id)));
-    }
-    EXPECT_TRUE(more().empty());
+    expectEntryEventsFor(ids);
 
     // Another restart announces nothing old.
-    reload();
-    subscribe(entryEvent);
-    EXPECT_TRUE(more().empty());
+    expectNothingAfterRestart(entryEvent);
 }
 
 TEST_F(AlertsOnBmcTest, ClearWhileUnloadedYieldsOneClearEvent)
 {
-    bmcsim::Options options;
-    options.records = temperatureRecords(3);
-    launch(options);
-    subscribe(clearEvent);
+    launchSubscribed(3, clearEvent);
     reload();
 
     bmc().clearSel();
@@ -337,9 +322,7 @@ TEST_F(AlertsOnBmcTest, ClearWhileUnloadedYieldsOneClearEvent)
     EXPECT_EQ(indication->instance.path.className, clearEvent);
     EXPECT_TRUE(more().empty());
 
-    reload();
-    subscribe(clearEvent);
-    EXPECT_TRUE(more().empty());
+    expectNothingAfterRestart(clearEvent);
 }
 
 TEST_F(AlertsOnBmcTest, PollerRecoversFromAFrozenBmc)
@@ -353,22 +336,12 @@ TEST_F(AlertsOnBmcTest, PollerRecoversFromAFrozenBmc)
     bmc().thaw();
     const auto ids =
         bmc().addRecords({temperatureRecord(0, 0), temperatureRecord(0, 0)});
-    for (const std::uint16_t id : ids)
-    {
-        const auto indication = next();
-        ASSERT_TRUE(indication.has_value()) << "no event for record " << id;
-        EXPECT_THAT(text(indication->instance, "AlertingManagedElement"),
-                    HasSubstr(recordIdKey(id)));
-    }
-    EXPECT_TRUE(more().empty());
+    expectEntryEventsFor(ids);
 }
 
 TEST_F(AlertsOnBmcTest, IdlePollsSendOneRequestEach)
 {
-    bmcsim::Options options;
-    options.records = temperatureRecords(5);
-    launch(options);
-    subscribe(entryEvent);
+    launchSubscribed(5, entryEvent);
     waitForPolls(1);
 
     const std::uint64_t requests = ipmi().requestCount();

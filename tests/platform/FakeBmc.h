@@ -4,6 +4,7 @@
 // with the faults real BMCs show: cancelled reservations, missing records,
 // ids that start again, refused commands.
 
+#include "SystemEventRecord.h"
 #include "ipmi/BmcCommands.h"
 #include "ipmi/IpmiError.h"
 #include "ipmi/RecordDescriber.h"
@@ -24,22 +25,8 @@ inline Ipmi::SelRecordBytes selRecord(std::uint16_t id,
                                       std::uint32_t time = 0x65e5831a,
                                       std::uint8_t sensorType = 0x01)
 {
-    return {static_cast<std::uint8_t>(id),
-            static_cast<std::uint8_t>(id >> 8),
-            0x02,
-            static_cast<std::uint8_t>(time),
-            static_cast<std::uint8_t>(time >> 8),
-            static_cast<std::uint8_t>(time >> 16),
-            static_cast<std::uint8_t>(time >> 24),
-            0x20,
-            0x00,
-            0x04,
-            sensorType,
-            0x30,
-            0x01,
-            0x57,
-            0x52,
-            0x50};
+    return bmcsim::systemEventRecord(
+        id, time, {sensorType, 0x30, 0x01, 0x57, 0x52, 0x50});
 }
 
 /** The "Log Area Reset/Cleared" record BMCs write after a clear. */

@@ -1,5 +1,6 @@
 #pragma once
 
+#include "EventClasses.h"
 #include "Values.h"
 
 #include <chrono>
@@ -10,10 +11,7 @@ namespace soak
 {
 
 constexpr const char* nameSpace = "root/zanqx";
-constexpr const char* entryEvent = "ZAN_MgmtHwLogEntryEvent";
-constexpr const char* clearEvent = "ZAN_MgmtHwLogClearEvent";
-constexpr const char* fullEvent = "ZAN_MgmtHwLogFullEvent";
-constexpr const char* restartEvent = "ZANx_AutomaticServerRestartEvent";
+using namespace testevents;
 
 /** How long a wait for something that normally takes milliseconds may
  *  last before the test gives up on it. */

@@ -2,6 +2,7 @@
 
 #include "Fixture.h"
 #include "NodeTree.h"
+#include "SystemEventRecord.h"
 #include "ipmi/FreeIpmiHandles.h"
 
 #include <arpa/inet.h>
@@ -602,7 +603,7 @@ std::vector<Record> generatedRecords(unsigned count, std::uint16_t firstId,
                                      std::uint32_t lastTime)
 {
     // Sensor type, number, event type, data 1-3.
-    static const std::uint8_t events[][6] = {
+    static const EventBytes events[] = {
         {0x01, 0x30, 0x01, 0x57, 0x52, 0x50}, // temperature above threshold
         {0x01, 0x30, 0x81, 0x57, 0x4e, 0x50}, // ... and back
         {0x04, 0x43, 0x01, 0x52, 0x05, 0x06}, // fan below threshold
@@ -616,19 +617,9 @@ std::vector<Record> generatedRecords(unsigned count, std::uint16_t firstId,
     {
         const unsigned id = firstId + i;
         const std::uint32_t time = lastTime - (count - 1 - i);
-        const auto& event = events[i % std::size(events)];
-        Record record{static_cast<std::uint8_t>(id),
-                      static_cast<std::uint8_t>(id >> 8),
-                      0x02,
-                      static_cast<std::uint8_t>(time),
-                      static_cast<std::uint8_t>(time >> 8),
-                      static_cast<std::uint8_t>(time >> 16),
-                      static_cast<std::uint8_t>(time >> 24),
-                      0x20,
-                      0x00,
-                      0x04};
-        std::copy(std::begin(event), std::end(event), record.begin() + 10);
-        records.push_back(record);
+        records.push_back(systemEventRecord(static_cast<std::uint16_t>(id),
+                                            time,
+                                            events[i % std::size(events)]));
     }
     return records;
 }
