@@ -16,7 +16,8 @@ extern "C" int LLVMFuzzerTestOneInput(const std::uint8_t* data,
         const QX::Platform::Configuration configuration =
             QX::Platform::parseConfiguration(text, "fuzz.conf");
         if (configuration.logLevel < 0 || configuration.traceLevel < 0 ||
-            configuration.source != "memory")
+            (configuration.source != "memory" &&
+             configuration.source != "ipmi"))
         {
             std::abort();
         }
