@@ -32,7 +32,7 @@ ObjectPath InstanceObject::effectivePath() const
     ordered.reserve(keys->keys.size() + path.keys.size());
     for (const auto& [keyName, type] : keys->keys)
     {
-        const Value* property = findNamed(properties, keyName);
+        const Value* property = findNamed(properties.list(), keyName);
         if (property != nullptr && !property->null)
         {
             ordered.emplace_back(keyName, *property);
@@ -89,8 +89,9 @@ CMPIData instGetProperty(const CMPIInstance* inst, const char* name,
         setStatus(rc, CMPI_RC_ERR_INVALID_HANDLE);
         return nullData();
     }
-    return lookupData(
-        *i->broker, name ? findNamed(i->properties, name) : nullptr, name, rc);
+    return lookupData(*i->broker,
+                      name ? findNamed(i->properties.list(), name) : nullptr,
+                      name, rc);
 }
 
 CMPIData instGetPropertyAt(const CMPIInstance* inst, CMPICount index,
@@ -102,7 +103,7 @@ CMPIData instGetPropertyAt(const CMPIInstance* inst, CMPICount index,
         setStatus(rc, CMPI_RC_ERR_INVALID_HANDLE);
         return nullData();
     }
-    return indexedData(*i->broker, i->properties, index, name, rc);
+    return indexedData(*i->broker, i->properties.list(), index, name, rc);
 }
 
 CMPICount instGetPropertyCount(const CMPIInstance* inst, CMPIStatus* rc)
@@ -132,7 +133,7 @@ CMPIStatus instSetProperty(const CMPIInstance* inst, const char* name,
     }
     if (i->accepts(name))
     {
-        setNamed(i->properties, name, std::move(v));
+        setNamed(i->properties.edit(), name, std::move(v));
     }
     return okStatus();
 }
@@ -177,7 +178,7 @@ CMPIStatus instSetPropertyFilter(CMPIInstance* inst, const char** properties,
     }
     i->filter = nameList(properties);
     i->filterKeys = nameList(keys);
-    std::erase_if(i->properties,
+    std::erase_if(i->properties.edit(),
                   [i](const auto& p) { return !i->accepts(p.first); });
     return okStatus();
 }

@@ -120,7 +120,7 @@ struct InstanceObject : Encapsulated<CMPIInstance, CMPIInstanceFT, &instanceFT>
         return from<InstanceObject>(i);
     }
     ObjectPath path; // as given to newInstance / setObjectPath
-    NamedValues properties;
+    SharedNamedValues properties;
     std::optional<std::vector<std::string>> filter; // NULL list: no filter
     std::vector<std::string> filterKeys;
 

@@ -191,6 +191,68 @@ void setNamed(NamedValues& values, std::string name, Value value)
     values.emplace_back(std::move(name), std::move(value));
 }
 
+SharedNamedValues::SharedNamedValues(NamedValues values) :
+    list_(std::make_shared<NamedValues>(std::move(values)))
+{
+}
+
+SharedNamedValues::SharedNamedValues(const SharedNamedValues& other) :
+    list_(other.list_), shared_(true)
+{
+    other.shared_.store(true, std::memory_order_relaxed);
+}
+
+SharedNamedValues::SharedNamedValues(SharedNamedValues&& other) noexcept :
+    list_(std::move(other.list_)),
+    shared_(other.shared_.load(std::memory_order_relaxed))
+{
+    other.shared_.store(false, std::memory_order_relaxed);
+}
+
+SharedNamedValues& SharedNamedValues::operator=(const SharedNamedValues& other)
+{
+    if (this != &other)
+    {
+        list_ = other.list_;
+        shared_.store(true, std::memory_order_relaxed);
+        other.shared_.store(true, std::memory_order_relaxed);
+    }
+    return *this;
+}
+
+SharedNamedValues&
+SharedNamedValues::operator=(SharedNamedValues&& other) noexcept
+{
+    if (this != &other)
+    {
+        list_ = std::move(other.list_);
+        shared_.store(other.shared_.load(std::memory_order_relaxed),
+                      std::memory_order_relaxed);
+        other.shared_.store(false, std::memory_order_relaxed);
+    }
+    return *this;
+}
+
+const NamedValues& SharedNamedValues::list() const
+{
+    static const NamedValues none;
+    return list_ ? *list_ : none;
+}
+
+NamedValues& SharedNamedValues::edit()
+{
+    if (!list_)
+    {
+        list_ = std::make_shared<NamedValues>();
+    }
+    else if (shared_.load(std::memory_order_relaxed))
+    {
+        list_ = std::make_shared<NamedValues>(*list_);
+    }
+    shared_.store(false, std::memory_order_relaxed);
+    return *list_;
+}
+
 const Value* ObjectPath::key(std::string_view name) const
 {
     return findNamed(keys, name);
@@ -209,12 +271,12 @@ bool ObjectPath::operator==(const ObjectPath& other) const
 
 const Value* Instance::property(std::string_view name) const
 {
-    return findNamed(properties, name);
+    return findNamed(properties.list(), name);
 }
 
 void Instance::setProperty(std::string name, Value value)
 {
-    setNamed(properties, std::move(name), std::move(value));
+    setNamed(properties.edit(), std::move(name), std::move(value));
 }
 
 std::vector<std::string> Instance::propertyNames() const

@@ -2,6 +2,7 @@
 
 #include <cmpidt.h>
 
+#include <atomic>
 #include <cstdint>
 #include <memory>
 #include <optional>
@@ -54,6 +55,60 @@ const Value* findNamed(const NamedValues& values, std::string_view name);
 // Replaces a value of the same name in place, or appends a new one.
 void setNamed(NamedValues& values, std::string name, Value value);
 
+// A list of named values that copies share until one of them changes it.
+// The instance a provider builds and every copy the broker takes of it (a
+// returned result, a delivered indication) hold one list, so returning an
+// instance costs no copy of its properties. Like a standard container,
+// copies may be read from several threads at once; a list being changed
+// must not be read or copied by another thread at the same time.
+class SharedNamedValues
+{
+  public:
+    SharedNamedValues() = default;
+    SharedNamedValues(NamedValues values); // NOLINT: reads as the list
+    SharedNamedValues(const SharedNamedValues& other);
+    SharedNamedValues(SharedNamedValues&& other) noexcept;
+    SharedNamedValues& operator=(const SharedNamedValues& other);
+    SharedNamedValues& operator=(SharedNamedValues&& other) noexcept;
+    ~SharedNamedValues() = default;
+
+    const NamedValues& list() const;
+    // The list to change: first a private copy when a copy shares it.
+    NamedValues& edit();
+
+    std::size_t size() const
+    {
+        return list().size();
+    }
+    bool empty() const
+    {
+        return list().empty();
+    }
+    NamedValues::const_iterator begin() const
+    {
+        return list().begin();
+    }
+    NamedValues::const_iterator end() const
+    {
+        return list().end();
+    }
+    const NamedValues::value_type& operator[](std::size_t index) const
+    {
+        return list()[index];
+    }
+    bool operator==(const SharedNamedValues& other) const
+    {
+        return list() == other.list();
+    }
+
+  private:
+    std::shared_ptr<NamedValues> list_;
+    // Set on both sides when a copy is taken; the side that edits next
+    // makes its own list. A flag rather than use_count(): a count read
+    // carries no ordering with the reads of a copy that was just released.
+    mutable std::atomic<bool> shared_{false};
+};
+
 struct ObjectPath
 {
     std::string nameSpace;
@@ -74,8 +129,8 @@ struct ObjectPath
 
 struct Instance
 {
-    ObjectPath path;        // as the broker's getObjectPath returns it
-    NamedValues properties; // in the order first set
+    ObjectPath path;              // as the broker's getObjectPath returns it
+    SharedNamedValues properties; // in the order first set
     const Value* property(std::string_view name) const;
     void setProperty(std::string name, Value value);
     std::vector<std::string> propertyNames() const;
