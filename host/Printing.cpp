@@ -148,35 +148,37 @@ std::string jsonValue(const Value& value)
     if (value.isArray())
     {
         std::string out = "[";
-        for (std::size_t i = 0; i < value.elements.size(); ++i)
+        for (std::size_t i = 0; i < value.elements().size(); ++i)
         {
-            out += (i ? ", " : "") + jsonValue(value.elements[i]);
+            out += (i ? ", " : "") + jsonValue(value.elements()[i]);
         }
         return out + "]";
     }
     switch (value.type)
     {
         case CMPI_boolean:
-            return value.u ? "true" : "false";
+            return value.unsignedValue() ? "true" : "false";
         case CMPI_char16:
         case CMPI_uint8:
         case CMPI_uint16:
         case CMPI_uint32:
         case CMPI_uint64:
-            return std::to_string(value.u);
+            return std::to_string(value.unsignedValue());
         case CMPI_sint8:
         case CMPI_sint16:
         case CMPI_sint32:
         case CMPI_sint64:
-            return std::to_string(value.s);
+            return std::to_string(value.signedValue());
         case CMPI_real32:
         case CMPI_real64:
-            return std::isfinite(value.r) ? realText(value.r) : "null";
+            return std::isfinite(value.realValue())
+                       ? realText(value.realValue())
+                       : "null";
         case CMPI_string:
         case CMPI_dateTime:
-            return jsonString(value.text);
+            return jsonString(value.text());
         case CMPI_ref:
-            return value.ref ? jsonString(value.ref->toString()) : "null";
+            return value.ref() ? jsonString(value.ref()->toString()) : "null";
         default:
             return "null";
     }

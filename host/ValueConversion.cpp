@@ -15,42 +15,42 @@ CMPIrc readScalar(const CMPIValue& v, CMPIType type, Value& out)
     switch (type)
     {
         case CMPI_boolean:
-            out.u = v.boolean ? 1 : 0;
+            out.setUnsigned(v.boolean ? 1 : 0);
             return CMPI_RC_OK;
         case CMPI_char16:
-            out.u = v.char16;
+            out.setUnsigned(v.char16);
             return CMPI_RC_OK;
         case CMPI_uint8:
-            out.u = v.uint8;
+            out.setUnsigned(v.uint8);
             return CMPI_RC_OK;
         case CMPI_uint16:
-            out.u = v.uint16;
+            out.setUnsigned(v.uint16);
             return CMPI_RC_OK;
         case CMPI_uint32:
-            out.u = v.uint32;
+            out.setUnsigned(v.uint32);
             return CMPI_RC_OK;
         case CMPI_uint64:
-            out.u = v.uint64;
+            out.setUnsigned(v.uint64);
             return CMPI_RC_OK;
         case CMPI_sint8:
             // A signed number, not a character.
             // NOLINTNEXTLINE(bugprone-signed-char-misuse,cert-str34-c)
-            out.s = v.sint8;
+            out.setSigned(v.sint8);
             return CMPI_RC_OK;
         case CMPI_sint16:
-            out.s = v.sint16;
+            out.setSigned(v.sint16);
             return CMPI_RC_OK;
         case CMPI_sint32:
-            out.s = v.sint32;
+            out.setSigned(v.sint32);
             return CMPI_RC_OK;
         case CMPI_sint64:
-            out.s = v.sint64;
+            out.setSigned(v.sint64);
             return CMPI_RC_OK;
         case CMPI_real32:
-            out.r = v.real32;
+            out.setReal(v.real32);
             return CMPI_RC_OK;
         case CMPI_real64:
-            out.r = v.real64;
+            out.setReal(v.real64);
             return CMPI_RC_OK;
         case CMPI_string:
         {
@@ -65,7 +65,7 @@ CMPIrc readScalar(const CMPIValue& v, CMPIType type, Value& out)
                 return CMPI_RC_ERR_INVALID_HANDLE;
             }
             out.null = !s->text.has_value();
-            out.text = s->text.value_or("");
+            out.setText(s->text.value_or(""));
             return CMPI_RC_OK;
         }
         case CMPI_dateTime:
@@ -80,7 +80,7 @@ CMPIrc readScalar(const CMPIValue& v, CMPIType type, Value& out)
             {
                 return CMPI_RC_ERR_INVALID_HANDLE;
             }
-            out.text = d->text;
+            out.setText(d->text);
             return CMPI_RC_OK;
         }
         case CMPI_ref:
@@ -95,7 +95,7 @@ CMPIrc readScalar(const CMPIValue& v, CMPIType type, Value& out)
             {
                 return CMPI_RC_ERR_INVALID_HANDLE;
             }
-            out.ref = std::make_shared<ObjectPath>(p->path);
+            out.setRef(std::make_shared<ObjectPath>(p->path));
             return CMPI_RC_OK;
         }
         case CMPI_instance:
@@ -130,7 +130,7 @@ CMPIrc readArray(const CMPIArray* array, CMPIType type, Value& out)
         return CMPI_RC_ERR_TYPE_MISMATCH;
     }
     out.null = false;
-    out.elements = a->elements;
+    out.setElements(a->elements);
     return CMPI_RC_OK;
 }
 
@@ -170,7 +170,7 @@ CMPIrc readArgument(const CMPIValue* value, CMPIType type, Value& out)
         if (value != nullptr)
         {
             out.null = false;
-            out.text = reinterpret_cast<const char*>(value);
+            out.setText(reinterpret_cast<const char*>(value));
         }
         return CMPI_RC_OK;
     }
@@ -208,7 +208,7 @@ CMPIrc readData(const CMPIData& data, Value& out)
         if (data.value.chars != nullptr)
         {
             out.null = false;
-            out.text = data.value.chars;
+            out.setText(data.value.chars);
         }
         return CMPI_RC_OK;
     }
@@ -234,68 +234,68 @@ CMPIData makeData(BrokerState& broker, const Value& value,
     {
         auto* a = broker.make<ArrayObject>();
         a->elementType = static_cast<CMPIType>(value.type & ~CMPI_ARRAY);
-        a->elements = value.elements;
+        a->elements = value.elements();
         d.value.array = &a->cmpi;
         return d;
     }
     switch (value.type)
     {
         case CMPI_boolean:
-            d.value.boolean = value.u ? 1 : 0;
+            d.value.boolean = value.unsignedValue() ? 1 : 0;
             break;
         case CMPI_char16:
-            d.value.char16 = static_cast<CMPIChar16>(value.u);
+            d.value.char16 = static_cast<CMPIChar16>(value.unsignedValue());
             break;
         case CMPI_uint8:
-            d.value.uint8 = static_cast<CMPIUint8>(value.u);
+            d.value.uint8 = static_cast<CMPIUint8>(value.unsignedValue());
             break;
         case CMPI_uint16:
-            d.value.uint16 = static_cast<CMPIUint16>(value.u);
+            d.value.uint16 = static_cast<CMPIUint16>(value.unsignedValue());
             break;
         case CMPI_uint32:
-            d.value.uint32 = static_cast<CMPIUint32>(value.u);
+            d.value.uint32 = static_cast<CMPIUint32>(value.unsignedValue());
             break;
         case CMPI_uint64:
-            d.value.uint64 = value.u;
+            d.value.uint64 = value.unsignedValue();
             break;
         case CMPI_sint8:
-            d.value.sint8 = static_cast<CMPISint8>(value.s);
+            d.value.sint8 = static_cast<CMPISint8>(value.signedValue());
             break;
         case CMPI_sint16:
-            d.value.sint16 = static_cast<CMPISint16>(value.s);
+            d.value.sint16 = static_cast<CMPISint16>(value.signedValue());
             break;
         case CMPI_sint32:
-            d.value.sint32 = static_cast<CMPISint32>(value.s);
+            d.value.sint32 = static_cast<CMPISint32>(value.signedValue());
             break;
         case CMPI_sint64:
-            d.value.sint64 = value.s;
+            d.value.sint64 = value.signedValue();
             break;
         case CMPI_real32:
-            d.value.real32 = static_cast<CMPIReal32>(value.r);
+            d.value.real32 = static_cast<CMPIReal32>(value.realValue());
             break;
         case CMPI_real64:
-            d.value.real64 = value.r;
+            d.value.real64 = value.realValue();
             break;
         case CMPI_string:
         {
             auto* s = broker.make<StringObject>();
-            s->text = value.text;
+            s->text = value.text();
             d.value.string = &s->cmpi;
             break;
         }
         case CMPI_dateTime:
         {
             auto* t = broker.make<DateTimeObject>();
-            t->text = value.text;
+            t->text = value.text();
             d.value.dateTime = &t->cmpi;
             break;
         }
         case CMPI_ref:
         {
             auto* p = broker.make<ObjectPathObject>();
-            if (value.ref)
+            if (value.ref())
             {
-                p->path = *value.ref;
+                p->path = *value.ref();
             }
             d.value.ref = &p->cmpi;
             break;

@@ -21,7 +21,7 @@ Value Value::boolean(bool value)
 {
     Value v;
     v.type = CMPI_boolean;
-    v.u = value ? 1 : 0;
+    v.setUnsigned(value ? 1 : 0);
     return v;
 }
 
@@ -29,7 +29,7 @@ Value Value::unsignedInt(CMPIType type, std::uint64_t value)
 {
     Value v;
     v.type = type;
-    v.u = value;
+    v.setUnsigned(value);
     return v;
 }
 
@@ -37,7 +37,7 @@ Value Value::signedInt(CMPIType type, std::int64_t value)
 {
     Value v;
     v.type = type;
-    v.s = value;
+    v.setSigned(value);
     return v;
 }
 
@@ -45,7 +45,7 @@ Value Value::real(CMPIType type, double value)
 {
     Value v;
     v.type = type;
-    v.r = value;
+    v.setReal(value);
     return v;
 }
 
@@ -53,7 +53,7 @@ Value Value::string(std::string value)
 {
     Value v;
     v.type = CMPI_string;
-    v.text = std::move(value);
+    v.setText(std::move(value));
     return v;
 }
 
@@ -61,7 +61,7 @@ Value Value::dateTime(std::string cimText)
 {
     Value v;
     v.type = CMPI_dateTime;
-    v.text = std::move(cimText);
+    v.setText(std::move(cimText));
     return v;
 }
 
@@ -69,7 +69,7 @@ Value Value::reference(ObjectPath path)
 {
     Value v;
     v.type = CMPI_ref;
-    v.ref = std::make_shared<ObjectPath>(std::move(path));
+    v.setRef(std::make_shared<ObjectPath>(std::move(path)));
     return v;
 }
 
@@ -77,8 +77,58 @@ Value Value::array(CMPIType elementType, std::vector<Value> elements)
 {
     Value v;
     v.type = static_cast<CMPIType>(storedType(elementType) | CMPI_ARRAY);
-    v.elements = std::move(elements);
+    v.setElements(std::move(elements));
     return v;
+}
+
+namespace
+{
+
+template <typename T>
+T scalarOf(const auto& payload)
+{
+    const T* held = std::get_if<T>(&payload);
+    return held != nullptr ? *held : T{};
+}
+
+template <typename T>
+const T& objectOf(const auto& payload)
+{
+    static const T none{};
+    const T* held = std::get_if<T>(&payload);
+    return held != nullptr ? *held : none;
+}
+
+} // namespace
+
+std::uint64_t Value::unsignedValue() const
+{
+    return scalarOf<std::uint64_t>(payload_);
+}
+
+std::int64_t Value::signedValue() const
+{
+    return scalarOf<std::int64_t>(payload_);
+}
+
+double Value::realValue() const
+{
+    return scalarOf<double>(payload_);
+}
+
+const std::string& Value::text() const
+{
+    return objectOf<std::string>(payload_);
+}
+
+const std::vector<Value>& Value::elements() const
+{
+    return objectOf<std::vector<Value>>(payload_);
+}
+
+const std::shared_ptr<ObjectPath>& Value::ref() const
+{
+    return objectOf<std::shared_ptr<ObjectPath>>(payload_);
 }
 
 std::string Value::toString() const
@@ -90,35 +140,36 @@ std::string Value::toString() const
     if (isArray())
     {
         std::string out = "{";
-        for (std::size_t i = 0; i < elements.size(); ++i)
+        const std::vector<Value>& items = elements();
+        for (std::size_t i = 0; i < items.size(); ++i)
         {
-            out += (i ? ", " : "") + elements[i].toString();
+            out += (i ? ", " : "") + items[i].toString();
         }
         return out + "}";
     }
     switch (type)
     {
         case CMPI_boolean:
-            return u ? "TRUE" : "FALSE";
+            return unsignedValue() ? "TRUE" : "FALSE";
         case CMPI_char16:
         case CMPI_uint8:
         case CMPI_uint16:
         case CMPI_uint32:
         case CMPI_uint64:
-            return std::to_string(u);
+            return std::to_string(unsignedValue());
         case CMPI_sint8:
         case CMPI_sint16:
         case CMPI_sint32:
         case CMPI_sint64:
-            return std::to_string(s);
+            return std::to_string(signedValue());
         case CMPI_real32:
         case CMPI_real64:
-            return realText(r);
+            return realText(realValue());
         case CMPI_string:
         case CMPI_dateTime:
-            return quoted(text);
+            return quoted(text());
         case CMPI_ref:
-            return ref ? quoted(ref->toString()) : "NULL";
+            return ref() ? quoted(ref()->toString()) : "NULL";
         default:
             return "<" + typeName(type) + ">";
     }
@@ -136,7 +187,7 @@ bool Value::operator==(const Value& other) const
     }
     if (isArray())
     {
-        return elements == other.elements;
+        return elements() == other.elements();
     }
     switch (type)
     {
@@ -144,17 +195,18 @@ bool Value::operator==(const Value& other) const
         case CMPI_sint16:
         case CMPI_sint32:
         case CMPI_sint64:
-            return s == other.s;
+            return signedValue() == other.signedValue();
         case CMPI_real32:
         case CMPI_real64:
-            return r == other.r;
+            return realValue() == other.realValue();
         case CMPI_string:
         case CMPI_dateTime:
-            return text == other.text;
+            return text() == other.text();
         case CMPI_ref:
-            return ref && other.ref ? *ref == *other.ref : ref == other.ref;
+            return ref() && other.ref() ? *ref() == *other.ref()
+                                        : ref() == other.ref();
         default:
-            return u == other.u;
+            return unsignedValue() == other.unsignedValue();
     }
 }
 

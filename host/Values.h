@@ -9,6 +9,7 @@
 #include <string>
 #include <string_view>
 #include <utility>
+#include <variant>
 #include <vector>
 
 namespace host
@@ -17,17 +18,46 @@ namespace host
 class Schema;
 struct ObjectPath;
 
-// A plain C++ copy of a CMPI value, independent of any request.
+// A plain C++ copy of a CMPI value, independent of any request. Only the
+// member of its kind is stored: instances hold many values, and the
+// broker keeps every instance of a request until the request ends.
 struct Value
 {
     CMPIType type = CMPI_null; // CMPI_chars is stored as CMPI_string
     bool null = false;
-    std::uint64_t u = 0;         // unsigned integers, char16 and boolean (0/1)
-    std::int64_t s = 0;          // signed integers
-    double r = 0;                // reals
-    std::string text;            // CMPI_string, CMPI_dateTime (25-char text)
-    std::vector<Value> elements; // arrays (type has the CMPI_ARRAY bit)
-    std::shared_ptr<ObjectPath> ref; // CMPI_ref
+
+    // Each reads its own kind and answers 0, "", {} or nullptr otherwise.
+    std::uint64_t unsignedValue() const; // unsigned, char16, boolean (0/1)
+    std::int64_t signedValue() const;
+    double realValue() const;
+    const std::string& text() const; // CMPI_string, CMPI_dateTime text
+    const std::vector<Value>& elements() const; // arrays
+    const std::shared_ptr<ObjectPath>& ref() const;
+
+    void setUnsigned(std::uint64_t value)
+    {
+        payload_ = value;
+    }
+    void setSigned(std::int64_t value)
+    {
+        payload_ = value;
+    }
+    void setReal(double value)
+    {
+        payload_ = value;
+    }
+    void setText(std::string value)
+    {
+        payload_ = std::move(value);
+    }
+    void setElements(std::vector<Value> elements)
+    {
+        payload_ = std::move(elements);
+    }
+    void setRef(std::shared_ptr<ObjectPath> path)
+    {
+        payload_ = std::move(path);
+    }
 
     // MOF-like text: "\"text\"", "42", "TRUE", "{1, 2}", "NULL".
     std::string toString() const;
@@ -46,6 +76,11 @@ struct Value
     static Value dateTime(std::string cimText);
     static Value reference(ObjectPath path);
     static Value array(CMPIType elementType, std::vector<Value> elements);
+
+  private:
+    std::variant<std::monostate, std::uint64_t, std::int64_t, double,
+                 std::string, std::vector<Value>, std::shared_ptr<ObjectPath>>
+        payload_;
 };
 
 using NamedValues = std::vector<std::pair<std::string, Value>>;

@@ -69,7 +69,7 @@ std::string keyText(const Value& v)
     switch (v.type)
     {
         case CMPI_char16:
-            return quoted(std::string(1, static_cast<char>(v.u)));
+            return quoted(std::string(1, static_cast<char>(v.unsignedValue())));
         default:
             return v.toString();
     }
@@ -337,7 +337,8 @@ class PathParser
                      value.type == CMPI_uint64 && (type & 0xC0) == 0x80)
             {
                 const unsigned bits = 8u << ((type - CMPI_uint8) >> 4);
-                if (bits < 64 && value.u >= (std::uint64_t{1} << bits))
+                if (bits < 64 &&
+                    value.unsignedValue() >= (std::uint64_t{1} << bits))
                 {
                     fail("key " + name + " out of range for its type");
                 }
@@ -346,20 +347,21 @@ class PathParser
             else if (type < 0x100 && (type & 0xC0) == 0xC0 &&
                      (value.type == CMPI_sint64 ||
                       (value.type == CMPI_uint64 &&
-                       value.u <=
+                       value.unsignedValue() <=
                            static_cast<std::uint64_t>(
                                std::numeric_limits<std::int64_t>::max()))))
             {
                 if (value.type == CMPI_uint64)
                 {
-                    value.s = static_cast<std::int64_t>(value.u);
-                    value.u = 0;
+                    value.setSigned(
+                        static_cast<std::int64_t>(value.unsignedValue()));
                 }
                 const unsigned bits = 8u << ((type - CMPI_sint8) >> 4);
                 if (bits < 64)
                 {
                     const std::int64_t limit = std::int64_t{1} << (bits - 1);
-                    if (value.s < -limit || value.s >= limit)
+                    if (value.signedValue() < -limit ||
+                        value.signedValue() >= limit)
                     {
                         fail("key " + name + " out of range for its type");
                     }

@@ -198,8 +198,8 @@ TEST(IndicationAgreement, AlertingElementsNameInstancesByTheirClassKeys)
         const host::Value* element =
             indication.property("AlertingManagedElement");
         ASSERT_NE(element, nullptr) << indication.path.className;
-        host::ObjectPath path = host::ObjectPath::parse(element->text);
-        ASSERT_NE(classes.find(path.className), nullptr) << element->text;
+        host::ObjectPath path = host::ObjectPath::parse(element->text());
+        ASSERT_NE(classes.find(path.className), nullptr) << element->text();
         // Path text carries no types: compare the key names only.
         for (auto& key : path.keys)
         {

@@ -72,9 +72,9 @@ TEST_F(BrokerFailures, FailedStringLeavesAPartlyFilledArray)
     const host::Value* descriptions =
         outcome.instances[0].property("StatusDescriptions");
     ASSERT_NE(descriptions, nullptr);
-    ASSERT_EQ(descriptions->elements.size(), 2u);
-    EXPECT_EQ(descriptions->elements[0].text, "OK");
-    EXPECT_TRUE(descriptions->elements[1].null);
+    ASSERT_EQ(descriptions->elements().size(), 2u);
+    EXPECT_EQ(descriptions->elements()[0].text(), "OK");
+    EXPECT_TRUE(descriptions->elements()[1].null);
 }
 
 TEST_F(BrokerFailures, RejectedDateTimeLeavesTheTimestampOut)

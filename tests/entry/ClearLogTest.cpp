@@ -33,7 +33,7 @@ void expectReturnValue(const host::Outcome& outcome, std::uint64_t value)
 {
     ASSERT_EQ(outcome.data.size(), 1u);
     EXPECT_EQ(outcome.data[0].type, CMPI_uint32);
-    EXPECT_EQ(outcome.data[0].u, value);
+    EXPECT_EQ(outcome.data[0].unsignedValue(), value);
     EXPECT_TRUE(outcome.done);
 }
 

@@ -119,7 +119,7 @@ TEST_F(IndicationDelivery, AlertsOneAfterAnotherAreEachDeliveredInOrder)
         const auto indication = next();
         ASSERT_TRUE(indication.has_value()) << "after " << i;
         delivered.push_back(
-            indication->instance.property("IndicationIdentifier")->text);
+            indication->instance.property("IndicationIdentifier")->text());
     }
     settle();
     EXPECT_EQ(delivered, expected);
@@ -139,7 +139,7 @@ TEST_F(IndicationDelivery, ClearLogBringsTheClearEvent)
     const auto delivered = next();
     ASSERT_TRUE(delivered.has_value());
     EXPECT_EQ(delivered->instance.path.className, clearEvent);
-    EXPECT_EQ(delivered->instance.property("EventID")->text,
+    EXPECT_EQ(delivered->instance.property("EventID")->text(),
               "Log Clear Event: IPMI:/bmc0/sel");
 }
 
@@ -296,7 +296,8 @@ TEST_F(IndicationDelivery, AThreadThatCannotBeStartedIsLoggedAndDropped)
     const auto delivered = next();
     ASSERT_TRUE(delivered.has_value());
     EXPECT_NE(delivered->instance.property("AlertingManagedElement")
-                  ->text.find("RecordID=\"2\""),
+                  ->text()
+                  .find("RecordID=\"2\""),
               std::string::npos);
 }
 

@@ -236,12 +236,12 @@ TEST_F(IndicationProperties, LogFullEventAtWarningFill)
                            source->raiseAlert("/bmc0/sel", alertTime);
                        });
     const host::Instance& instance = delivered.instance;
-    EXPECT_EQ(instance.property("EventID")->text,
+    EXPECT_EQ(instance.property("EventID")->text(),
               "IPMI Log Full Warning Event : IPMI:/bmc0/sel");
-    EXPECT_EQ(instance.property("PerceivedSeverity")->u, 3u);
-    EXPECT_EQ(instance.property("Message")->text,
+    EXPECT_EQ(instance.property("PerceivedSeverity")->unsignedValue(), 3u);
+    EXPECT_EQ(instance.property("Message")->text(),
               "The IPMI System Event Log is 75 percent full.");
-    EXPECT_EQ(instance.property("Description")->text,
+    EXPECT_EQ(instance.property("Description")->text(),
               "The IPMI System Event Log is 75 percent full.");
 }
 
@@ -286,9 +286,10 @@ TEST_P(RestartCauses, AnyOtherCauseIsANormalRestart)
             source->raiseAlert("/bmc0/wdt", alertTime);
         });
     const host::Instance& instance = delivered.instance;
-    EXPECT_EQ(instance.property("PerceivedSeverity")->u, 2u);
-    EXPECT_EQ(instance.property("Message")->text, "The server was restarted.");
-    EXPECT_EQ(instance.property("Description")->text,
+    EXPECT_EQ(instance.property("PerceivedSeverity")->unsignedValue(), 2u);
+    EXPECT_EQ(instance.property("Message")->text(),
+              "The server was restarted.");
+    EXPECT_EQ(instance.property("Description")->text(),
               "The server was restarted.");
 }
 
@@ -313,18 +314,19 @@ TEST_F(IndicationProperties, RecordIdsAreDecimalWithoutPadding)
         const auto delivered = next();
         ASSERT_TRUE(delivered.has_value());
         const std::string element =
-            delivered->instance.property("AlertingManagedElement")->text;
+            delivered->instance.property("AlertingManagedElement")->text();
         EXPECT_NE(element.find("RecordID=\"" + std::to_string(id) + "\""),
                   std::string::npos)
             << element;
         // An empty description leaves the identifier empty and the event
         // id with its trailing blank.
-        EXPECT_EQ(delivered->instance.property("IndicationIdentifier")->text,
+        EXPECT_EQ(delivered->instance.property("IndicationIdentifier")->text(),
                   "");
-        EXPECT_EQ(delivered->instance.property("EventID")->text,
+        EXPECT_EQ(delivered->instance.property("EventID")->text(),
                   "LogEntry Creation Event: ");
         EXPECT_EQ(delivered->instance.property("CorrelatedIndications")
-                      ->elements.size(),
+                      ->elements()
+                      .size(),
                   0u);
     }
 }
@@ -335,7 +337,7 @@ TEST_F(IndicationProperties, MessagesFollowTheConfiguredLanguage)
     const auto delivered = deliveredAfter(
         restartEvent, [&] { source->raiseAlert("/bmc0/wdt", alertTime); });
     QX::Locale::configureLanguage("");
-    EXPECT_EQ(delivered.instance.property("Message")->text,
+    EXPECT_EQ(delivered.instance.property("Message")->text(),
               "Der Server wurde vom Hardware-Watchdog automatisch neu "
               "gestartet.");
 }

@@ -61,26 +61,26 @@ TEST_F(InstanceOperations, EnumerateLogInstanceWithEveryProperty)
                                                     "Capabilities",
                                                     "StatusDescriptions"};
     EXPECT_EQ(log.propertyNames(), expectedOrder);
-    EXPECT_EQ(log.property("Name")->text, "IPMI SEL Log");
-    EXPECT_EQ(log.property("CreationClassName")->text, "ZAN_MgmtHwLog");
-    EXPECT_EQ(log.property("Caption")->text, "IPMI SEL LOG");
-    EXPECT_EQ(log.property("Description")->text,
+    EXPECT_EQ(log.property("Name")->text(), "IPMI SEL Log");
+    EXPECT_EQ(log.property("CreationClassName")->text(), "ZAN_MgmtHwLog");
+    EXPECT_EQ(log.property("Caption")->text(), "IPMI SEL LOG");
+    EXPECT_EQ(log.property("Description")->text(),
               "Intelligent platform Management Interface SEL");
-    EXPECT_EQ(log.property("Status")->text, "OK");
+    EXPECT_EQ(log.property("Status")->text(), "OK");
     EXPECT_EQ(log.property("Node")->type, CMPI_uint16);
-    EXPECT_EQ(log.property("Node")->u, 1u);
+    EXPECT_EQ(log.property("Node")->unsignedValue(), 1u);
     EXPECT_EQ(log.property("MaxNumberOfRecords")->type, CMPI_uint64);
-    EXPECT_EQ(log.property("MaxNumberOfRecords")->u, 512u);
-    EXPECT_EQ(log.property("CurrentNumberOfRecords")->u, 3u);
-    EXPECT_EQ(log.property("OverWritePolicy")->u, 2u);
-    EXPECT_EQ(log.property("EnabledState")->u, 2u);
-    EXPECT_EQ(log.property("RequestedState")->u, 2u);
-    EXPECT_EQ(log.property("CharacterSet")->u, 7u);
-    EXPECT_EQ(log.property("MaxLogSize")->u, 10240u);
+    EXPECT_EQ(log.property("MaxNumberOfRecords")->unsignedValue(), 512u);
+    EXPECT_EQ(log.property("CurrentNumberOfRecords")->unsignedValue(), 3u);
+    EXPECT_EQ(log.property("OverWritePolicy")->unsignedValue(), 2u);
+    EXPECT_EQ(log.property("EnabledState")->unsignedValue(), 2u);
+    EXPECT_EQ(log.property("RequestedState")->unsignedValue(), 2u);
+    EXPECT_EQ(log.property("CharacterSet")->unsignedValue(), 7u);
+    EXPECT_EQ(log.property("MaxLogSize")->unsignedValue(), 10240u);
     EXPECT_EQ(log.property("PercentageNearFull")->type, CMPI_uint8);
-    EXPECT_EQ(log.property("PercentageNearFull")->u, 0u);
+    EXPECT_EQ(log.property("PercentageNearFull")->unsignedValue(), 0u);
     EXPECT_EQ(log.property("IsFrozen")->type, CMPI_boolean);
-    EXPECT_EQ(log.property("IsFrozen")->u, 0u);
+    EXPECT_EQ(log.property("IsFrozen")->unsignedValue(), 0u);
     EXPECT_EQ(log.property("OperationalStatus")->toString(), "{2, 11}");
     EXPECT_EQ(log.property("OperationalStatus")->type, CMPI_uint16A);
     EXPECT_EQ(log.property("Capabilities")->toString(), "{6}");
@@ -101,8 +101,8 @@ TEST_F(InstanceOperations, LogPathCarriesItsKeysAndTheLocalHost)
     EXPECT_EQ(path.className, "ZAN_MgmtHwLog");
     EXPECT_EQ(path.host, QX::getSystemName());
     ASSERT_EQ(path.keys.size(), 2u);
-    EXPECT_EQ(path.key("Name")->text, "IPMI SEL Log");
-    EXPECT_EQ(path.key("CreationClassName")->text, "ZAN_MgmtHwLog");
+    EXPECT_EQ(path.key("Name")->text(), "IPMI SEL Log");
+    EXPECT_EQ(path.key("CreationClassName")->text(), "ZAN_MgmtHwLog");
 }
 
 TEST_F(InstanceOperations, EntryInstancesInKeyOrderWithTheirProperties)
@@ -118,31 +118,33 @@ TEST_F(InstanceOperations, EntryInstancesInKeyOrderWithTheirProperties)
     // Keys are printable node paths with five-digit ids: 00009 < 00010.
     const host::Instance& first = outcome.instances[0];
     const host::Instance& second = outcome.instances[1];
-    EXPECT_EQ(first.property("RecordID")->text, "9");
-    EXPECT_EQ(second.property("RecordID")->text, "10");
-    EXPECT_EQ(first.property("Node")->u, 2u) << "walk ordinal";
+    EXPECT_EQ(first.property("RecordID")->text(), "9");
+    EXPECT_EQ(second.property("RecordID")->text(), "10");
+    EXPECT_EQ(first.property("Node")->unsignedValue(), 2u) << "walk ordinal";
     const std::vector<std::string> expectedOrder = {
         "CreationClassName",    "Caption",    "Description", "ElementName",
         "LogCreationClassName", "LogName",    "RecordID",    "RecordData",
         "MessageTimestamp",     "DataFormat", "Node",        "Source"};
     EXPECT_EQ(second.propertyNames(), expectedOrder);
-    EXPECT_EQ(second.property("CreationClassName")->text, "ZAN_MgmtHwLogEntry");
-    EXPECT_EQ(second.property("Caption")->text, "IPMI SEL LOG");
-    EXPECT_EQ(second.property("Description")->text, "Fan FAN3 low");
-    EXPECT_EQ(second.property("ElementName")->text,
+    EXPECT_EQ(second.property("CreationClassName")->text(),
+              "ZAN_MgmtHwLogEntry");
+    EXPECT_EQ(second.property("Caption")->text(), "IPMI SEL LOG");
+    EXPECT_EQ(second.property("Description")->text(), "Fan FAN3 low");
+    EXPECT_EQ(second.property("ElementName")->text(),
               source->printablePath("/bmc0/sel/entry-00010"));
-    EXPECT_EQ(second.property("LogCreationClassName")->text, "ZAN_MgmtHwLog");
-    EXPECT_EQ(second.property("LogName")->text, "IPMI SEL Log");
-    EXPECT_EQ(second.property("RecordData")->text, "0a 0b");
+    EXPECT_EQ(second.property("LogCreationClassName")->text(), "ZAN_MgmtHwLog");
+    EXPECT_EQ(second.property("LogName")->text(), "IPMI SEL Log");
+    EXPECT_EQ(second.property("RecordData")->text(), "0a 0b");
     EXPECT_EQ(second.property("MessageTimestamp")->type, CMPI_dateTime);
-    EXPECT_EQ(second.property("MessageTimestamp")->text,
+    EXPECT_EQ(second.property("MessageTimestamp")->text(),
               "20080523044811.000000+000");
-    EXPECT_EQ(second.property("DataFormat")->text, "hex bytes");
-    EXPECT_EQ(second.property("Source")->text, "IPMI");
+    EXPECT_EQ(second.property("DataFormat")->text(), "hex bytes");
+    EXPECT_EQ(second.property("Source")->text(), "IPMI");
     const host::ObjectPath& path = second.path;
     EXPECT_EQ(path.keys.size(), 5u);
-    EXPECT_EQ(path.key("RecordID")->text, "10");
-    EXPECT_EQ(path.key("MessageTimestamp")->text, "20080523044811.000000+000");
+    EXPECT_EQ(path.key("RecordID")->text(), "10");
+    EXPECT_EQ(path.key("MessageTimestamp")->text(),
+              "20080523044811.000000+000");
 }
 
 TEST_F(InstanceOperations, RejectedTimestampLeavesOnlyThatPropertyOut)
@@ -226,7 +228,7 @@ TEST_F(InstanceOperations, GetInstanceFindsTheMatchingEntry)
     ASSERT_EQ(outcome.rc, CMPI_RC_OK);
     EXPECT_TRUE(outcome.done);
     ASSERT_EQ(outcome.instances.size(), 1u);
-    EXPECT_EQ(outcome.instances[0].property("RecordID")->text, "4");
+    EXPECT_EQ(outcome.instances[0].property("RecordID")->text(), "4");
 }
 
 TEST_F(InstanceOperations, GetInstanceMatchesKeyNamesIgnoringCase)
@@ -238,7 +240,7 @@ TEST_F(InstanceOperations, GetInstanceMatchesKeyNamesIgnoringCase)
         {"CREATIONCLASSNAME", host::Value::string("ZAN_MgmtHwLog")});
     const auto outcome = host().getInstance(path);
     ASSERT_EQ(outcome.instances.size(), 1u);
-    EXPECT_EQ(outcome.instances[0].property("Name")->text, "IPMI SEL Log");
+    EXPECT_EQ(outcome.instances[0].property("Name")->text(), "IPMI SEL Log");
 }
 
 TEST_F(InstanceOperations, GetInstanceListingKeysFindsTheEntry)
@@ -250,7 +252,7 @@ TEST_F(InstanceOperations, GetInstanceListingKeysFindsTheEntry)
         "Node"};
     const auto outcome = host().getInstance(target, &keysAndNode);
     ASSERT_EQ(outcome.instances.size(), 1u);
-    EXPECT_EQ(outcome.instances[0].property("Node")->u, 1u);
+    EXPECT_EQ(outcome.instances[0].property("Node")->unsignedValue(), 1u);
     EXPECT_EQ(outcome.instances[0].property("Description"), nullptr);
 }
 

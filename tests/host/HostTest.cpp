@@ -285,7 +285,7 @@ TEST_F(HostTest, InvokeMethod)
     ASSERT_EQ(out.data.size(), 1u);
     EXPECT_EQ(out.data[0], host::Value::unsignedInt(CMPI_uint32, 0));
     ASSERT_EQ(out.outArgs.size(), 1u);
-    EXPECT_EQ(out.outArgs[0].second.text, "yes");
+    EXPECT_EQ(out.outArgs[0].second.text(), "yes");
     EXPECT_EQ(recorder.calls.back(), "invoke ClearLog with 0");
 }
 

@@ -119,7 +119,7 @@ TEST_F(InstanceTest, ResetKeepsFirstPosition)
     i->ft->setProperty(i, "a", chars("3"), CMPI_chars);
     const host::Instance copy = host::Broker::toInstance(i);
     EXPECT_EQ(copy.propertyNames(), (std::vector<std::string>{"A", "B"}));
-    EXPECT_EQ(copy.property("A")->text, "3");
+    EXPECT_EQ(copy.property("A")->text(), "3");
 }
 
 TEST_F(InstanceTest, PropertyFilterDropsUnlistedNames)
@@ -180,7 +180,7 @@ TEST_F(InstanceTest, ObjectPathTakesKeysFromSchema)
     EXPECT_EQ(copy.keys[0].first, "CreationClassName"); // schema order
     EXPECT_EQ(copy.keys[1].first, "LogName");
     EXPECT_EQ(copy.keys[2].first, "RecordID");
-    EXPECT_EQ(copy.keys[2].second.text, "5"); // property wins over path key
+    EXPECT_EQ(copy.keys[2].second.text(), "5"); // property wins over path key
     EXPECT_EQ(copy.keys[3].first, "Extra");
     EXPECT_EQ(copy.key("Severity"), nullptr);
 }

@@ -37,7 +37,7 @@ TEST_F(ResultTest, CollectsEverythingInOrder)
     ASSERT_EQ(out.paths.size(), 1u);
     EXPECT_EQ(out.paths[0].className, "P");
     ASSERT_EQ(out.instances.size(), 1u);
-    EXPECT_EQ(out.instances[0].property("X")->text, "x");
+    EXPECT_EQ(out.instances[0].property("X")->text(), "x");
     ASSERT_EQ(out.data.size(), 2u);
     EXPECT_EQ(out.data[0], host::Value::unsignedInt(CMPI_uint32, 4));
     EXPECT_EQ(out.data[1], host::Value::string("t"));

@@ -65,7 +65,7 @@ TEST_F(ThreadTest, DetachedThreadDeliversIndication)
     ASSERT_EQ(delivered.size(), 1u);
     EXPECT_EQ(delivered[0].nameSpace, "root/interop");
     EXPECT_EQ(delivered[0].instance.path.className, "ZAN_Alert");
-    EXPECT_EQ(delivered[0].instance.property("Message")->text, "hot");
+    EXPECT_EQ(delivered[0].instance.property("Message")->text(), "hot");
     EXPECT_EQ(delivered[0].broker, mb());
     mb()->xft->destroyCondition(s.cond);
     mb()->xft->destroyMutex(s.mutex);
@@ -225,7 +225,7 @@ TEST(ConcurrentRequests, ManyThreadsUseOneBroker)
                     const host::Outcome out =
                         request.finish({CMPI_RC_OK, nullptr});
                     if (out.instances.size() != 1 ||
-                        out.instances[0].property("N")->u !=
+                        out.instances[0].property("N")->unsignedValue() !=
                             static_cast<std::uint64_t>(n))
                     {
                         ++failures;

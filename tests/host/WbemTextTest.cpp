@@ -82,13 +82,13 @@ TEST(WbemText, SchemaGivesKeyTypes)
         &schema);
     EXPECT_EQ(p.key("RecordID")->type, CMPI_string);
     EXPECT_EQ(p.key("MessageTimestamp")->type, CMPI_dateTime);
-    EXPECT_EQ(p.key("MessageTimestamp")->text, "20080523044811.000000+000");
+    EXPECT_EQ(p.key("MessageTimestamp")->text(), "20080523044811.000000+000");
     EXPECT_EQ(p.key("Other")->type, CMPI_string);
     // Text that is no datetime is kept as it is, for providers to reject.
     const ObjectPath bad = ObjectPath::parse(
         "ZAN_MgmtHwLogEntry.MessageTimestamp=\"yesterday\"", &schema);
     EXPECT_EQ(bad.key("MessageTimestamp")->type, CMPI_dateTime);
-    EXPECT_EQ(bad.key("MessageTimestamp")->text, "yesterday");
+    EXPECT_EQ(bad.key("MessageTimestamp")->text(), "yesterday");
     // A value of the wrong kind keeps its parsed type.
     const ObjectPath wrong =
         ObjectPath::parse("ZAN_MgmtHwLogEntry.RecordID=3", &schema);

@@ -163,14 +163,14 @@ unsigned BmcTest::ipmitoolEntries() const
 std::string text(const host::Instance& instance, const std::string& name)
 {
     const host::Value* value = instance.property(name);
-    return value != nullptr ? value->text : std::string();
+    return value != nullptr ? value->text() : std::string();
 }
 
 std::uint64_t number(const host::Instance& instance, const std::string& name)
 {
     const host::Value* value = instance.property(name);
     EXPECT_NE(value, nullptr) << name;
-    return value != nullptr ? value->u : 0;
+    return value != nullptr ? value->unsignedValue() : 0;
 }
 
 } // namespace bmctest

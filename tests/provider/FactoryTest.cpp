@@ -197,11 +197,11 @@ TEST_F(Collection, EntriesComeInByteOrderOfTheirKeysNotInWalkOrder)
     const auto instances = collect("ZAN_MgmtHwLogEntry");
     EXPECT_EQ(lastResult_, 0u);
     ASSERT_EQ(instances.size(), 3u);
-    EXPECT_EQ(instances[0].property("Description")->text, "/bmc0/sel/B");
-    EXPECT_EQ(instances[1].property("Description")->text, "/bmc0/sel/a");
-    EXPECT_EQ(instances[2].property("Description")->text, "/bmc0/sel/z");
+    EXPECT_EQ(instances[0].property("Description")->text(), "/bmc0/sel/B");
+    EXPECT_EQ(instances[1].property("Description")->text(), "/bmc0/sel/a");
+    EXPECT_EQ(instances[2].property("Description")->text(), "/bmc0/sel/z");
     // The walk ordinal stays that of the hardware order.
-    EXPECT_EQ(instances[0].property("Node")->u, 2u);
+    EXPECT_EQ(instances[0].property("Node")->unsignedValue(), 2u);
 }
 
 TEST_F(Collection, UnknownClassIsLoggedAtLevel6000)
@@ -234,7 +234,8 @@ TEST_F(Collection, OneLogRecordGivesOneInstance)
     const auto instances = collect("ZAN_MgmtHwLog");
     EXPECT_EQ(lastResult_, 0u);
     ASSERT_EQ(instances.size(), 1u);
-    EXPECT_EQ(instances[0].property("CurrentNumberOfRecords")->u, 4u);
+    EXPECT_EQ(instances[0].property("CurrentNumberOfRecords")->unsignedValue(),
+              4u);
 }
 
 } // namespace

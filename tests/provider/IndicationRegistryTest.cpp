@@ -389,12 +389,12 @@ TEST_F(AlertHandlers, AFullEventOfAnyOtherConditionIsAtZeroPercent)
         "IPMI:/bmc0/sel", QX::DateTime(2024, 1, 2, 3, 4, 5, 6, 0), "");
     ASSERT_NE(instance, nullptr);
     const host::Instance full = host::Broker::toInstance(instance);
-    EXPECT_EQ(full.property("PerceivedSeverity")->u, 2u);
-    EXPECT_EQ(full.property("Message")->text,
+    EXPECT_EQ(full.property("PerceivedSeverity")->unsignedValue(), 2u);
+    EXPECT_EQ(full.property("Message")->text(),
               "The IPMI System Event Log is 0 percent full.");
-    EXPECT_EQ(full.property("EventID")->text,
+    EXPECT_EQ(full.property("EventID")->text(),
               "IPMI Log Full  Event : IPMI:/bmc0/sel");
-    EXPECT_EQ(full.property("IndicationTime")->text,
+    EXPECT_EQ(full.property("IndicationTime")->text(),
               "20240102030405.000006+000");
 }
 

@@ -253,7 +253,8 @@ void MixedLoad::runRequests(host::Host& host, unsigned thread)
                     problems.add("ClearLog: rc " + std::to_string(outcome.rc));
                 }
                 if (outcome.data.size() != 1 ||
-                    outcome.data[0].u != static_cast<unsigned>(outcome.rc) ||
+                    outcome.data[0].unsignedValue() !=
+                        static_cast<unsigned>(outcome.rc) ||
                     !outcome.done)
                 {
                     problems.add("ClearLog: return value does not mirror rc");

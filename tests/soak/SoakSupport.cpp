@@ -74,7 +74,7 @@ std::string textOf(const host::Instance& instance, const char* name)
     {
         return "<missing or not a string>";
     }
-    return value->text;
+    return value->text();
 }
 
 } // namespace
@@ -93,7 +93,7 @@ std::string malformation(const host::DeliveredIndication& indication)
     }
     const host::Value* time = instance.property("IndicationTime");
     if (time == nullptr || time->type != CMPI_dateTime ||
-        time->text.size() != 25)
+        time->text().size() != 25)
     {
         return className + " without a CIM datetime IndicationTime";
     }
