@@ -20,13 +20,12 @@ bool InstanceObject::accepts(std::string_view name) const
            std::any_of(filterKeys.begin(), filterKeys.end(), matches);
 }
 
-ObjectPath InstanceObject::effectivePath() const
+SharedNamedValues InstanceObject::orderedKeys() const
 {
-    ObjectPath result = path;
     const ClassKeys* keys = broker->schema.find(path.className);
     if (keys == nullptr)
     {
-        return result;
+        return path.keys;
     }
     NamedValues ordered;
     ordered.reserve(keys->keys.size() + path.keys.size());
@@ -49,8 +48,28 @@ ObjectPath InstanceObject::effectivePath() const
             ordered.emplace_back(keyName, value);
         }
     }
-    result.keys = std::move(ordered);
+    return ordered;
+}
+
+ObjectPath InstanceObject::effectivePath() const
+{
+    ObjectPath result;
+    result.nameSpace = path.nameSpace;
+    result.className = path.className;
+    result.host = path.host;
+    const std::lock_guard lock(effectiveKeysMutex_);
+    if (!effectiveKeys_)
+    {
+        effectiveKeys_ = orderedKeys();
+    }
+    result.keys = *effectiveKeys_;
     return result;
+}
+
+void InstanceObject::changed()
+{
+    const std::lock_guard lock(effectiveKeysMutex_);
+    effectiveKeys_.reset();
 }
 
 Instance InstanceObject::snapshot() const
@@ -134,6 +153,7 @@ CMPIStatus instSetProperty(const CMPIInstance* inst, const char* name,
     if (i->accepts(name))
     {
         setNamed(i->properties.edit(), name, std::move(v));
+        i->changed();
     }
     return okStatus();
 }
@@ -180,6 +200,7 @@ CMPIStatus instSetPropertyFilter(CMPIInstance* inst, const char** properties,
     i->filterKeys = nameList(keys);
     std::erase_if(i->properties.edit(),
                   [i](const auto& p) { return !i->accepts(p.first); });
+    i->changed();
     return okStatus();
 }
 
@@ -200,6 +221,7 @@ CMPIStatus instSetObjectPath(CMPIInstance* inst, const CMPIObjectPath* op)
         return errorStatus(CMPI_RC_ERR_INVALID_HANDLE);
     }
     i->path = p->path;
+    i->changed();
     return okStatus();
 }
 

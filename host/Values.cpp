@@ -307,12 +307,12 @@ NamedValues& SharedNamedValues::edit()
 
 const Value* ObjectPath::key(std::string_view name) const
 {
-    return findNamed(keys, name);
+    return findNamed(keys.list(), name);
 }
 
 void ObjectPath::setKey(std::string name, Value value)
 {
-    setNamed(keys, std::move(name), std::move(value));
+    setNamed(keys.edit(), std::move(name), std::move(value));
 }
 
 bool ObjectPath::operator==(const ObjectPath& other) const

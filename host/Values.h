@@ -4,6 +4,7 @@
 
 #include <atomic>
 #include <cstdint>
+#include <initializer_list>
 #include <memory>
 #include <optional>
 #include <string>
@@ -92,8 +93,9 @@ void setNamed(NamedValues& values, std::string name, Value value);
 
 // A list of named values that copies share until one of them changes it.
 // The instance a provider builds and every copy the broker takes of it (a
-// returned result, a delivered indication) hold one list, so returning an
-// instance costs no copy of its properties. Like a standard container,
+// returned result, a delivered indication, its object path) hold one list,
+// so returning an instance or its path costs no copy of its properties or
+// keys. Like a standard container,
 // copies may be read from several threads at once; a list being changed
 // must not be read or copied by another thread at the same time.
 class SharedNamedValues
@@ -101,6 +103,10 @@ class SharedNamedValues
   public:
     SharedNamedValues() = default;
     SharedNamedValues(NamedValues values); // NOLINT: reads as the list
+    SharedNamedValues(std::initializer_list<NamedValues::value_type> values) :
+        SharedNamedValues(NamedValues(values))
+    {
+    }
     SharedNamedValues(const SharedNamedValues& other);
     SharedNamedValues(SharedNamedValues&& other) noexcept;
     SharedNamedValues& operator=(const SharedNamedValues& other);
@@ -149,7 +155,7 @@ struct ObjectPath
     std::string nameSpace;
     std::string className;
     std::string host;
-    NamedValues keys; // in insertion order
+    SharedNamedValues keys; // in insertion order
 
     const Value* key(std::string_view name) const;
     void setKey(std::string name, Value value);

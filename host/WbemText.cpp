@@ -131,7 +131,7 @@ class PathParser
             {
                 value = applySchema(*keys, name, std::move(value));
             }
-            path.keys.emplace_back(std::move(name), std::move(value));
+            path.keys.edit().emplace_back(std::move(name), std::move(value));
             if (atEnd())
             {
                 return path;

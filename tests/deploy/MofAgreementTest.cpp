@@ -201,7 +201,7 @@ TEST(IndicationAgreement, AlertingElementsNameInstancesByTheirClassKeys)
         host::ObjectPath path = host::ObjectPath::parse(element->text());
         ASSERT_NE(classes.find(path.className), nullptr) << element->text();
         // Path text carries no types: compare the key names only.
-        for (auto& key : path.keys)
+        for (auto& key : path.keys.edit())
         {
             key.second.type = CMPI_null;
         }

@@ -15,8 +15,9 @@ class ClearLog : public ProviderTest
     host::ObjectPath logPath(const std::string& className = "ZAN_MgmtHwLog")
     {
         host::ObjectPath path = classPath(className);
-        path.keys.push_back({"Name", host::Value::string("IPMI SEL Log")});
-        path.keys.push_back(
+        path.keys.edit().push_back(
+            {"Name", host::Value::string("IPMI SEL Log")});
+        path.keys.edit().push_back(
             {"CreationClassName", host::Value::string("ZAN_MgmtHwLog")});
         return path;
     }

@@ -132,7 +132,7 @@ TEST_F(FixedOperations, WritesAreNotSupported)
 {
     install(entry::selTree(2));
     host::ObjectPath path = classPath("ZAN_MgmtHwLog");
-    path.keys.push_back({"Name", host::Value::string("IPMI SEL Log")});
+    path.keys.edit().push_back({"Name", host::Value::string("IPMI SEL Log")});
     host::Instance instance;
     instance.path = path;
     expectNotSupported(host().createInstance(path, instance));

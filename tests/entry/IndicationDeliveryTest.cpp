@@ -131,9 +131,9 @@ TEST_F(IndicationDelivery, ClearLogBringsTheClearEvent)
     subscribe(clearEvent);
     enable();
     host::ObjectPath log = classPath("ZAN_MgmtHwLog");
-    log.keys.emplace_back("CreationClassName",
-                          host::Value::string("ZAN_MgmtHwLog"));
-    log.keys.emplace_back("Name", host::Value::string("IPMI SEL Log"));
+    log.keys.edit().emplace_back("CreationClassName",
+                                 host::Value::string("ZAN_MgmtHwLog"));
+    log.keys.edit().emplace_back("Name", host::Value::string("IPMI SEL Log"));
     const host::Outcome cleared = host().invokeMethod(log, "ClearLog");
     ASSERT_EQ(cleared.rc, CMPI_RC_OK);
     const auto delivered = next();

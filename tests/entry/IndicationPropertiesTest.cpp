@@ -94,8 +94,8 @@ host::ObjectPath eventPath(const std::string& className)
 std::string logElement()
 {
     host::ObjectPath path = eventPath("ZAN_MgmtHwLog");
-    path.keys.emplace_back("CreationClassName", text("ZAN_MgmtHwLog"));
-    path.keys.emplace_back("Name", text("IMPI SEL Log"));
+    path.keys.edit().emplace_back("CreationClassName", text("ZAN_MgmtHwLog"));
+    path.keys.edit().emplace_back("Name", text("IMPI SEL Log"));
     return path.toString();
 }
 

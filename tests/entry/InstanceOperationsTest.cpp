@@ -235,8 +235,8 @@ TEST_F(InstanceOperations, GetInstanceMatchesKeyNamesIgnoringCase)
 {
     install(selTree(2));
     host::ObjectPath path = classPath("ZAN_MgmtHwLog");
-    path.keys.push_back({"name", host::Value::string("IPMI SEL Log")});
-    path.keys.push_back(
+    path.keys.edit().push_back({"name", host::Value::string("IPMI SEL Log")});
+    path.keys.edit().push_back(
         {"CREATIONCLASSNAME", host::Value::string("ZAN_MgmtHwLog")});
     const auto outcome = host().getInstance(path);
     ASSERT_EQ(outcome.instances.size(), 1u);
@@ -272,8 +272,8 @@ TEST_F(InstanceOperations, GetInstanceWithoutMatchDeliversNothing)
 {
     install(selTree(2));
     host::ObjectPath path = classPath("ZAN_MgmtHwLog");
-    path.keys.push_back({"Name", host::Value::string("ipmi sel log")});
-    path.keys.push_back(
+    path.keys.edit().push_back({"Name", host::Value::string("ipmi sel log")});
+    path.keys.edit().push_back(
         {"CreationClassName", host::Value::string("ZAN_MgmtHwLog")});
     const auto outcome = host().getInstance(path);
     EXPECT_EQ(outcome.rc, CMPI_RC_OK);
@@ -337,7 +337,7 @@ TEST_F(InstanceOperations, HugeClassNameIsHandledWithoutHarm)
         [&]
         {
             host::ObjectPath path = classPath(huge);
-            path.keys.push_back({"Name", host::Value::string(huge)});
+            path.keys.edit().push_back({"Name", host::Value::string(huge)});
             return path;
         }());
     EXPECT_FALSE(names.done);

@@ -94,8 +94,8 @@ TEST_F(Loading, TenThousandRequestsKeepWorking)
 {
     host::Host host(SELPROV_LIBRARY);
     host::ObjectPath path = classPath("ZAN_MgmtHwLog");
-    path.keys.push_back({"Name", host::Value::string("IPMI SEL Log")});
-    path.keys.push_back(
+    path.keys.edit().push_back({"Name", host::Value::string("IPMI SEL Log")});
+    path.keys.edit().push_back(
         {"CreationClassName", host::Value::string("ZAN_MgmtHwLog")});
     for (int i = 0; i < 10000; ++i)
     {

@@ -327,7 +327,7 @@ std::vector<Case> cases()
          [](const Call& c)
          {
              ObjectPath path = c.firstEntry;
-             for (auto& key : path.keys)
+             for (auto& key : path.keys.edit())
              {
                  key.second = Value::boolean(true);
              }
@@ -338,7 +338,7 @@ std::vector<Case> cases()
          [](const Call& c)
          {
              ObjectPath path = c.firstEntry;
-             for (auto& key : path.keys)
+             for (auto& key : path.keys.edit())
              {
                  key.second = Value::string(hugeName + directives);
              }

@@ -80,8 +80,8 @@ host::Outcome BmcTest::clearLog()
     host::ObjectPath path;
     path.nameSpace = "root/zanqx";
     path.className = "ZAN_MgmtHwLog";
-    path.keys.push_back({"Name", host::Value::string("IPMI SEL Log")});
-    path.keys.push_back(
+    path.keys.edit().push_back({"Name", host::Value::string("IPMI SEL Log")});
+    path.keys.edit().push_back(
         {"CreationClassName", host::Value::string("ZAN_MgmtHwLog")});
     return host_->invokeMethod(path, "ClearLog");
 }

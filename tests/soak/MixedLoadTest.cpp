@@ -39,8 +39,8 @@ constexpr const char* churnedClasses[] = {entryEvent, fullEvent, restartEvent};
 host::ObjectPath logPath()
 {
     host::ObjectPath path = entry::classPath("ZAN_MgmtHwLog");
-    path.keys.push_back({"Name", host::Value::string("IPMI SEL Log")});
-    path.keys.push_back(
+    path.keys.edit().push_back({"Name", host::Value::string("IPMI SEL Log")});
+    path.keys.edit().push_back(
         {"CreationClassName", host::Value::string("ZAN_MgmtHwLog")});
     return path;
 }
