@@ -20,12 +20,13 @@ bool InstanceObject::accepts(std::string_view name) const
            std::any_of(filterKeys.begin(), filterKeys.end(), matches);
 }
 
-SharedNamedValues InstanceObject::orderedKeys() const
+ObjectPath InstanceObject::effectivePath() const
 {
+    ObjectPath result = path;
     const ClassKeys* keys = broker->schema.find(path.className);
     if (keys == nullptr)
     {
-        return path.keys;
+        return result;
     }
     NamedValues ordered;
     ordered.reserve(keys->keys.size() + path.keys.size());
@@ -48,28 +49,8 @@ SharedNamedValues InstanceObject::orderedKeys() const
             ordered.emplace_back(keyName, value);
         }
     }
-    return ordered;
-}
-
-ObjectPath InstanceObject::effectivePath() const
-{
-    ObjectPath result;
-    result.nameSpace = path.nameSpace;
-    result.className = path.className;
-    result.host = path.host;
-    const std::lock_guard lock(effectiveKeysMutex_);
-    if (!effectiveKeys_)
-    {
-        effectiveKeys_ = orderedKeys();
-    }
-    result.keys = *effectiveKeys_;
+    result.keys = std::move(ordered);
     return result;
-}
-
-void InstanceObject::changed()
-{
-    const std::lock_guard lock(effectiveKeysMutex_);
-    effectiveKeys_.reset();
 }
 
 Instance InstanceObject::snapshot() const
@@ -153,7 +134,6 @@ CMPIStatus instSetProperty(const CMPIInstance* inst, const char* name,
     if (i->accepts(name))
     {
         setNamed(i->properties.edit(), name, std::move(v));
-        i->changed();
     }
     return okStatus();
 }
@@ -200,7 +180,6 @@ CMPIStatus instSetPropertyFilter(CMPIInstance* inst, const char** properties,
     i->filterKeys = nameList(keys);
     std::erase_if(i->properties.edit(),
                   [i](const auto& p) { return !i->accepts(p.first); });
-    i->changed();
     return okStatus();
 }
 
@@ -221,7 +200,6 @@ CMPIStatus instSetObjectPath(CMPIInstance* inst, const CMPIObjectPath* op)
         return errorStatus(CMPI_RC_ERR_INVALID_HANDLE);
     }
     i->path = p->path;
-    i->changed();
     return okStatus();
 }
 

@@ -129,16 +129,6 @@ struct InstanceObject : Encapsulated<CMPIInstance, CMPIInstanceFT, &instanceFT>
     // the key properties set on the instance, in the class's key order.
     ObjectPath effectivePath() const;
     Instance snapshot() const;
-    // To be called after every change of path or properties: the keys of
-    // the effective path are kept from one request for them to the next,
-    // so that every copy of the path shares them.
-    void changed();
-
-  private:
-    SharedNamedValues orderedKeys() const;
-
-    mutable std::mutex effectiveKeysMutex_;
-    mutable std::optional<SharedNamedValues> effectiveKeys_;
 };
 
 struct ResultObject : Encapsulated<CMPIResult, CMPIResultFT, &resultFT>

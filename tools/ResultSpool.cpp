@@ -2,25 +2,38 @@
 
 #include "Printing.h"
 
+#include <array>
+#include <cerrno>
+#include <cstring>
+#include <stdexcept>
+
 namespace selprov
 {
 
-ResultSpool::ResultSpool(bool json) : json_(json)
+ResultSpool::ResultSpool(bool json) : json_(json), file_(std::tmpfile())
 {
     handlers_.instance = [this](const host::Instance& instance)
-    { keep(json_ ? host::jsonInstance(instance) : host::formatMof(instance)); };
-    handlers_.path = [this](const host::ObjectPath& path) {
-        keep(json_ ? host::jsonString(path.toString())
-                   : path.toString() + "\n");
+    {
+        if (json_)
+        {
+            keep(",\n ", host::jsonInstance(instance));
+        }
+        else
+        {
+            keep("\n", host::formatMof(instance));
+        }
     };
-}
-
-void ResultSpool::keep(std::string text)
-{
-    // A text built by appending may hold twice its length; thousands of
-    // them are kept until the request ends.
-    text.shrink_to_fit();
-    texts_.push_back(std::move(text));
+    handlers_.path = [this](const host::ObjectPath& path)
+    {
+        if (json_)
+        {
+            keep(",\n ", host::jsonString(path.toString()));
+        }
+        else
+        {
+            keep("", path.toString() + "\n");
+        }
+    };
 }
 
 const host::ResultHandlers* ResultSpool::handlers() const
@@ -28,40 +41,69 @@ const host::ResultHandlers* ResultSpool::handlers() const
     return &handlers_;
 }
 
-void ResultSpool::printJsonArray(std::ostream& out) const
+void ResultSpool::keep(std::string_view separator, const std::string& text)
 {
-    out << "[";
-    for (std::size_t i = 0; i < texts_.size(); ++i)
+    if (results_++ > 0)
     {
-        out << (i ? ",\n " : "") << texts_[i];
+        append(separator);
     }
-    out << "]\n";
+    append(text);
 }
 
-void ResultSpool::printInstances(std::ostream& out) const
+void ResultSpool::append(std::string_view text)
+{
+    if (!file_)
+    {
+        memory_.append(text);
+        return;
+    }
+    if (writeError_ == 0 &&
+        std::fwrite(text.data(), 1, text.size(), file_.get()) != text.size())
+    {
+        writeError_ = errno != 0 ? errno : EIO;
+    }
+}
+
+void ResultSpool::copyTo(std::ostream& out)
+{
+    if (!file_)
+    {
+        out << memory_;
+        return;
+    }
+    std::FILE* file = file_.get();
+    if (writeError_ == 0 && std::fflush(file) != 0)
+    {
+        writeError_ = errno != 0 ? errno : EIO;
+    }
+    if (writeError_ != 0)
+    {
+        throw std::runtime_error(std::string("cannot keep the results: ") +
+                                 std::strerror(writeError_));
+    }
+    std::rewind(file);
+    std::array<char, 65536> buffer{};
+    std::size_t read = 0;
+    while ((read = std::fread(buffer.data(), 1, buffer.size(), file)) > 0)
+    {
+        out.write(buffer.data(), static_cast<std::streamsize>(read));
+    }
+    if (std::ferror(file) != 0)
+    {
+        throw std::runtime_error("cannot read back the results");
+    }
+}
+
+void ResultSpool::print(std::ostream& out)
 {
     if (json_)
     {
-        printJsonArray(out);
+        out << "[";
+        copyTo(out);
+        out << "]\n";
         return;
     }
-    for (std::size_t i = 0; i < texts_.size(); ++i)
-    {
-        out << (i ? "\n" : "") << texts_[i];
-    }
-}
-
-void ResultSpool::printPaths(std::ostream& out) const
-{
-    if (json_)
-    {
-        printJsonArray(out);
-        return;
-    }
-    for (const std::string& text : texts_)
-    {
-        out << text;
-    }
+    copyTo(out);
 }
 
 } // namespace selprov

@@ -133,7 +133,7 @@ host::Outcome run(const selprov::Options& o, host::Host& h)
     {
         case Command::EnumerateNames:
         {
-            const selprov::ResultSpool spool(o.json);
+            selprov::ResultSpool spool(o.json);
             out = timed(o,
                         [&] {
                             return h.enumerateInstanceNames(
@@ -141,13 +141,13 @@ host::Outcome run(const selprov::Options& o, host::Host& h)
                         });
             if (out.rc == CMPI_RC_OK)
             {
-                spool.printPaths(std::cout);
+                spool.print(std::cout);
             }
             break;
         }
         case Command::Enumerate:
         {
-            const selprov::ResultSpool spool(o.json);
+            selprov::ResultSpool spool(o.json);
             out = timed(o,
                         [&]
                         {
@@ -158,13 +158,13 @@ host::Outcome run(const selprov::Options& o, host::Host& h)
                         });
             if (out.rc == CMPI_RC_OK)
             {
-                spool.printInstances(std::cout);
+                spool.print(std::cout);
             }
             break;
         }
         case Command::Get:
         {
-            const selprov::ResultSpool spool(o.json);
+            selprov::ResultSpool spool(o.json);
             out = timed(o,
                         [&]
                         {
@@ -175,7 +175,7 @@ host::Outcome run(const selprov::Options& o, host::Host& h)
                         });
             if (out.rc == CMPI_RC_OK)
             {
-                spool.printInstances(std::cout);
+                spool.print(std::cout);
             }
             break;
         }
