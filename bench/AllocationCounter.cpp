@@ -15,12 +15,13 @@ namespace
 std::atomic<std::uint64_t> allocated{0};
 std::atomic<std::int64_t> live{0};
 std::atomic<std::int64_t> peak{0};
+std::atomic<bool> counting{true};
 
 void* counted(void* block)
 {
-    if (block == nullptr)
+    if (block == nullptr || !counting.load(std::memory_order_relaxed))
     {
-        return nullptr;
+        return block;
     }
     const auto size = static_cast<std::int64_t>(malloc_usable_size(block));
     allocated.fetch_add(static_cast<std::uint64_t>(size),
@@ -37,7 +38,7 @@ void* counted(void* block)
 
 void uncount(void* block)
 {
-    if (block != nullptr)
+    if (block != nullptr && counting.load(std::memory_order_relaxed))
     {
         live.fetch_sub(static_cast<std::int64_t>(malloc_usable_size(block)),
                        std::memory_order_relaxed);
@@ -82,6 +83,11 @@ HeapTally heapTally()
     return {allocated.load(std::memory_order_relaxed),
             live.load(std::memory_order_relaxed),
             peak.load(std::memory_order_relaxed)};
+}
+
+void countAllocations(bool on)
+{
+    counting.store(on, std::memory_order_relaxed);
 }
 
 void resetPeak()

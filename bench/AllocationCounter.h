@@ -18,5 +18,9 @@ struct HeapTally
 HeapTally heapTally();
 // Starts a new peak at the current live bytes.
 void resetPeak();
+// Counting is on at start. Off, allocations cost what they cost without
+// the counter, for timing; blocks freed while it is off are not subtracted,
+// so tallies compare only between points where it was on throughout.
+void countAllocations(bool on);
 
 } // namespace bench
