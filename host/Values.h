@@ -139,7 +139,8 @@ class SharedNamedValues
     }
     bool operator==(const SharedNamedValues& other) const
     {
-        return list() == other.list();
+        return (list_ != nullptr && list_ == other.list_) ||
+               list() == other.list();
     }
 
   private:
