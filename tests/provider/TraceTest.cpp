@@ -203,6 +203,53 @@ TEST_F(MarkingTest, ErrorLineGoesToBothChannelsAt6000)
     }
 }
 
+TEST_F(MarkingTest, EachChannelThatWritesGetsTheLineFormattedAfresh)
+{
+    CVLog::LoggerSettings settings;
+    settings.logLevel = 4000;
+    settings.traceLevel = 4000;
+    CVLog::CVLogger::configure(settings);
+    int formatted = 0;
+    QX::logAndTrace("fn", "SEL.cpp", 5, "Corvane.SELProvider", 4000,
+                    [&]
+                    {
+                        ++formatted;
+                        return formatted == 1 ? "first" : "second";
+                    });
+    EXPECT_EQ(formatted, 2);
+    const auto records = logRecords();
+    ASSERT_EQ(records.size(), 2u);
+    EXPECT_EQ(records[0].channel, CVLog::Channel::Log);
+    EXPECT_EQ(records[0].message, "first");
+    EXPECT_EQ(records[1].channel, CVLog::Channel::Trace);
+    EXPECT_EQ(records[1].message, "second");
+}
+
+TEST_F(MarkingTest, LinesThatNoChannelWritesAreNotFormatted)
+{
+    CVLog::LoggerSettings settings;
+    settings.logLevel = 6000;
+    settings.traceLevel = 0;
+    CVLog::CVLogger::configure(settings);
+    int formatted = 0;
+    const auto format = [&]
+    {
+        ++formatted;
+        return "line";
+    };
+    QX::logAndTrace("fn", "SEL.cpp", 5, "Corvane.SELProvider", 4000, format);
+    EXPECT_EQ(formatted, 0);
+    EXPECT_TRUE(logRecords().empty());
+
+    // A failure still reaches the log channel, and only that one.
+    QX::logAndTrace("fn", "SEL.cpp", 6, "Corvane.SELProvider", 6000, format);
+    EXPECT_EQ(formatted, 1);
+    const auto records = logRecords();
+    ASSERT_EQ(records.size(), 1u);
+    EXPECT_EQ(records[0].channel, CVLog::Channel::Log);
+    EXPECT_EQ(records[0].message, "line");
+}
+
 TEST(ProviderExceptionTest, WhatReturnsTheText)
 {
     const QX::ProviderException error("getAllSELCMPIInstances Failed");
