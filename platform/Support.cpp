@@ -41,8 +41,10 @@ std::string stripSpaces(std::string text)
     {
         return {};
     }
-    const std::size_t last = text.find_last_not_of(blanks);
-    return text.substr(first, last - first + 1);
+    // Trimmed in place: the copy the caller handed over is the result.
+    text.erase(text.find_last_not_of(blanks) + 1);
+    text.erase(0, first);
+    return text;
 }
 
 bool textEqual(const char* left, const char* right)
