@@ -1,5 +1,10 @@
 #include "Support.h"
 
+#include <cerrno>
+#include <cstring>
+#include <sched.h>
+#include <string>
+#include <thread>
 #include <unistd.h>
 
 #include <gtest/gtest.h>
@@ -12,6 +17,86 @@ TEST(Support, SystemNameIsTheHostName)
     ASSERT_EQ(gethostname(expected, sizeof expected - 1), 0);
     EXPECT_EQ(getSystemName(), expected);
     EXPECT_FALSE(getSystemName().empty());
+}
+
+TEST(Support, SystemNameIsTheHostNameInsideAScopeToo)
+{
+    char expected[256] = {};
+    ASSERT_EQ(gethostname(expected, sizeof expected - 1), 0);
+    const SystemNameScope outer;
+    EXPECT_EQ(getSystemName(), expected);
+    {
+        const SystemNameScope inner;
+        EXPECT_EQ(getSystemName(), expected);
+    }
+    EXPECT_EQ(getSystemName(), expected);
+}
+
+namespace
+{
+
+/** What a thread in a UTS namespace of its own saw of getSystemName
+ *  while its host name changed. */
+struct RenamedHostView
+{
+    std::string skipped; // why the check could not run, if it could not
+    std::string before;
+    std::string inScopeAfterRename;
+    std::string nestedAfterSecondRename;
+    std::string afterScope;
+    std::string unscoped;
+};
+
+RenamedHostView renameHostWhileScoped()
+{
+    RenamedHostView view;
+    // Only this thread moves to a new UTS namespace, so renaming the host
+    // there leaves the machine's name alone.
+    if (unshare(CLONE_NEWUTS) != 0)
+    {
+        view.skipped =
+            std::string("no UTS namespace of our own: ") + std::strerror(errno);
+        return view;
+    }
+    const auto rename = [](const char* name)
+    { return sethostname(name, std::strlen(name)) == 0; };
+    if (!rename("scope-first"))
+    {
+        view.skipped = "sethostname refused";
+        return view;
+    }
+    {
+        const SystemNameScope scope;
+        view.before = getSystemName();
+        rename("scope-second");
+        view.inScopeAfterRename = getSystemName();
+        {
+            const SystemNameScope nested;
+            rename("scope-third");
+            view.nestedAfterSecondRename = getSystemName();
+        }
+    }
+    view.afterScope = getSystemName();
+    rename("scope-fourth");
+    view.unscoped = getSystemName();
+    return view;
+}
+
+} // namespace
+
+TEST(Support, AScopeReadsTheSystemNameOnceAndTheNextCallReadsAgain)
+{
+    RenamedHostView view;
+    std::thread([&] { view = renameHostWhileScoped(); }).join();
+    if (!view.skipped.empty())
+    {
+        GTEST_SKIP() << view.skipped;
+    }
+    EXPECT_EQ(view.before, "scope-first");
+    EXPECT_EQ(view.inScopeAfterRename, "scope-first");
+    EXPECT_EQ(view.nestedAfterSecondRename, "scope-first");
+    EXPECT_EQ(view.afterScope, "scope-third");
+    EXPECT_EQ(view.unscoped, "scope-fourth");
 }
 
 TEST(Support, StripSpacesRemovesSurroundingBlanksOnly)
