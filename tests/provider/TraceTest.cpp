@@ -132,6 +132,14 @@ TEST(TraceHeader, PathEndsInTheTraceHeader)
 
 class MarkingTest : public PlatformTest
 {
+  protected:
+    static void setLevels(int logLevel, int traceLevel)
+    {
+        CVLog::LoggerSettings settings;
+        settings.logLevel = logLevel;
+        settings.traceLevel = traceLevel;
+        CVLog::CVLogger::configure(settings);
+    }
 };
 
 TEST_F(MarkingTest, EntryMarkingMakesFourLoggerCallsAtLevel4000)
@@ -205,10 +213,7 @@ TEST_F(MarkingTest, ErrorLineGoesToBothChannelsAt6000)
 
 TEST_F(MarkingTest, EachChannelThatWritesGetsTheLineFormattedAfresh)
 {
-    CVLog::LoggerSettings settings;
-    settings.logLevel = 4000;
-    settings.traceLevel = 4000;
-    CVLog::CVLogger::configure(settings);
+    setLevels(4000, 4000);
     int formatted = 0;
     QX::logAndTrace("fn", "SEL.cpp", 5, "Corvane.SELProvider", 4000,
                     [&]
@@ -227,10 +232,7 @@ TEST_F(MarkingTest, EachChannelThatWritesGetsTheLineFormattedAfresh)
 
 TEST_F(MarkingTest, LinesThatNoChannelWritesAreNotFormatted)
 {
-    CVLog::LoggerSettings settings;
-    settings.logLevel = 6000;
-    settings.traceLevel = 0;
-    CVLog::CVLogger::configure(settings);
+    setLevels(6000, 0);
     int formatted = 0;
     const auto format = [&]
     {
