@@ -60,8 +60,6 @@ unsigned SELObjectFactory::getAllSELCMPIInstances(
 {
     constexpr const char* function = "getAllSELCMPIInstances";
     traceEdge(function, __LINE__, ENTRY_TRACE);
-    // Every instance's path names this system: ask for the name once.
-    const SystemNameScope oneSystemName;
     if (textEqual(className, LOG_CLASS_NAME))
     {
         for (const auto& [key, record] : logRecords)

@@ -23,7 +23,8 @@ std::string getSystemName();
  * of this type lives, getSystemName on the same thread answers every call
  * with the name it read at the first one. A host name that changes during
  * the scope is seen by the next scope; to the request this is the same as a
- * change just after it ended. Scopes nest: the outermost one decides.
+ * change just after it ended. Scopes nest: the outermost one decides. A
+ * scope belongs to the thread that made it and must end on that thread.
  */
 class SystemNameScope
 {
