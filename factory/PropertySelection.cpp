@@ -1,5 +1,7 @@
 #include "PropertySelection.h"
 
+#include <algorithm>
+
 namespace QX::SELComposite
 {
 
@@ -10,14 +12,16 @@ PropertySelection::PropertySelection(const char** properties, bool keysOnly) :
     {
         for (const char** name = properties; *name != nullptr; ++name)
         {
-            requested_.insert(*name);
+            requested_.emplace_back(*name);
         }
+        std::sort(requested_.begin(), requested_.end());
     }
 }
 
 bool PropertySelection::wants(const char* name) const
 {
-    return all_ || requested_.count(name) != 0;
+    return all_ || std::binary_search(requested_.begin(), requested_.end(),
+                                      std::string_view(name));
 }
 
 } // namespace QX::SELComposite

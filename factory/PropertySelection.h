@@ -1,7 +1,7 @@
 #pragma once
 
-#include <set>
-#include <string>
+#include <string_view>
+#include <vector>
 
 namespace QX::SELComposite
 {
@@ -11,6 +11,7 @@ namespace QX::SELComposite
  *
  * All of them when the request gave no property list and did not ask for
  * keys only; otherwise exactly the listed names, compared byte for byte.
+ * The names are not copied: the request's list must outlive the selection.
  */
 class PropertySelection
 {
@@ -20,7 +21,7 @@ class PropertySelection
     bool wants(const char* name) const;
 
   private:
-    std::set<std::string> requested_;
+    std::vector<std::string_view> requested_; // sorted
     bool all_;
 };
 

@@ -2,6 +2,7 @@
 
 #include "DateTime.h"
 #include "SEL.h"
+#include "Support.h"
 
 #include <cmpidt.h>
 #include <cmpift.h>
@@ -25,6 +26,7 @@ constexpr const char* LOG_ENTRY_CLASS_NAME = "ZAN_MgmtHwLogEntry";
  *        them into CMPI instances.
  *
  * The constructor reads the hardware; nothing is cached between requests.
+ * A factory is made, used and destroyed on one thread.
  */
 class SELObjectFactory
 {
@@ -72,6 +74,9 @@ class SELObjectFactory
     std::uint32_t numberOfInstances = 0;
     LogMap logRecords;
     EntryMap entryRecords;
+    // Every instance's path names this system: a request asks for the name
+    // once, however many instances it builds.
+    SystemNameScope oneSystemName;
 };
 
 } // namespace QX::SELComposite

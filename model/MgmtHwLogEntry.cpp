@@ -2,6 +2,8 @@
 
 #include "Support.h"
 
+#include <utility>
+
 namespace QX::SELComposite
 {
 
@@ -10,9 +12,9 @@ std::string MgmtHwLogEntry::getElementName()
     return stripSpaces(elementName);
 }
 
-bool MgmtHwLogEntry::setElementName(const std::string& text)
+bool MgmtHwLogEntry::setElementName(std::string text)
 {
-    elementName = text;
+    elementName = std::move(text);
     return !elementName.empty();
 }
 
@@ -21,9 +23,9 @@ std::string MgmtHwLogEntry::getDescription()
     return stripSpaces(description);
 }
 
-bool MgmtHwLogEntry::setDescription(const std::string& text)
+bool MgmtHwLogEntry::setDescription(std::string text)
 {
-    description = text;
+    description = std::move(text);
     return !description.empty();
 }
 

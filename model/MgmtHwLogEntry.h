@@ -20,10 +20,10 @@ class MgmtHwLogEntry
 
     std::string getElementName();
     /** Stores the text; false when it is empty. */
-    bool setElementName(const std::string& text);
+    bool setElementName(std::string text);
     std::string getDescription();
     /** Stores the text; false when it is empty. */
-    bool setDescription(const std::string& text);
+    bool setDescription(std::string text);
     std::uint16_t getNode();
     bool setNode(unsigned short value);
     std::string getSeverity();

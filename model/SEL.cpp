@@ -5,10 +5,10 @@
 #include "sdk/qxlib/include/Trace.h"
 
 #include <array>
+#include <charconv>
 #include <cstring>
 #include <exception>
 #include <iostream>
-#include <sstream>
 #include <utility>
 
 namespace QX::SELComposite
@@ -39,6 +39,8 @@ constexpr std::uint16_t requestedStateOther = 12;
 
 /** Size of the timestamp working buffer, terminator included. */
 constexpr std::size_t timestampBufferSize = 64;
+/** What follows the date and time digits of an entry's CIM timestamp. */
+constexpr std::string_view cimTimestampTail = ".000000+000";
 
 void traceEdge(const char* function, int line, MessageType type)
 {
@@ -163,7 +165,7 @@ int getMgmtHwLogEntryInstances(EntryMap& entries)
                     {
                         MgmtHwLogEntry entry;
                         ++ordinal;
-                        const std::string key = entryCursor.convertPathToString(
+                        std::string key = entryCursor.convertPathToString(
                             entryCursor.getPathToNode());
                         if (!entry.setElementName(key))
                         {
@@ -188,17 +190,15 @@ int getMgmtHwLogEntryInstances(EntryMap& entries)
                             entry.recordID = convertUintToString(recordId);
                         }
                         entry.logName = logName;
-                        if (entryCursor.getProperty(NodeLexicon::RecordData,
-                                                    scratch))
-                        {
-                            entry.recordData = scratch;
-                        }
+                        // A read stores nothing when it fails, so reading
+                        // straight into the field leaves it as made, just as
+                        // a copy from the scratch text after a successful
+                        // read would.
+                        entryCursor.getProperty(NodeLexicon::RecordData,
+                                                entry.recordData);
                         logCursor.selectNode(logPath);
-                        if (logCursor.getProperty(NodeLexicon::DataFormat,
-                                                  scratch))
-                        {
-                            entry.dataFormat = scratch;
-                        }
+                        logCursor.getProperty(NodeLexicon::DataFormat,
+                                              entry.dataFormat);
                         if (entryCursor.getProperty(NodeLexicon::Timestamp,
                                                     scratch))
                         {
@@ -207,7 +207,7 @@ int getMgmtHwLogEntryInstances(EntryMap& entries)
                         }
                         // Entries come in path order, so the place for
                         // the key is nearly always the end of the map.
-                        entries.insert_or_assign(entries.end(), key,
+                        entries.insert_or_assign(entries.end(), std::move(key),
                                                  std::move(entry));
                         ++entryCursor;
                     }
@@ -241,9 +241,11 @@ int clearLog()
 
 std::string convertUintToString(std::uint32_t value)
 {
-    std::ostringstream text;
-    text << value;
-    return text.str();
+    // Ten digits hold the largest 32-bit value.
+    std::array<char, 10> digits{};
+    const auto printed =
+        std::to_chars(digits.data(), digits.data() + digits.size(), value);
+    return {digits.data(), printed.ptr};
 }
 
 std::string convertTimestampToCIM(const std::string& timestamp)
@@ -251,8 +253,9 @@ std::string convertTimestampToCIM(const std::string& timestamp)
     std::array<char, timestampBufferSize> buffer{};
     // Cut to what the buffer holds; an inner NUL ends the text.
     std::strncpy(buffer.data(), timestamp.c_str(), buffer.size() - 1);
-    std::string result;
     const std::string_view text(buffer.data());
+    std::string result;
+    result.reserve(text.size() + cimTimestampTail.size());
     std::size_t position = 0;
     while (position < text.size())
     {
@@ -265,7 +268,7 @@ std::string convertTimestampToCIM(const std::string& timestamp)
         result.append(text.substr(start, end - start));
         position = end == std::string_view::npos ? text.size() : end;
     }
-    result.append(".000000+000");
+    result.append(cimTimestampTail);
     return result;
 }
 

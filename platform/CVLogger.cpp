@@ -1,6 +1,7 @@
 #include "CVLogger.h"
 
 #include <algorithm>
+#include <atomic>
 #include <utility>
 
 namespace CVLog
@@ -14,6 +15,12 @@ struct LoggerState
     std::mutex mutex;
     std::shared_ptr<LogSink> sink = makeSyslogSink();
     LoggerSettings settings;
+    // Copies of the two thresholds and of whether a sink is installed,
+    // written under the mutex, so that a line below every threshold is
+    // turned away without taking it.
+    std::atomic<int> logThreshold{LoggerSettings{}.logLevel};
+    std::atomic<int> traceThreshold{LoggerSettings{}.traceLevel};
+    std::atomic<bool> hasSink{true};
 };
 
 LoggerState& state()
@@ -30,6 +37,21 @@ bool lists(const std::vector<std::string>& components,
                        { return listed == "*" || listed == component; });
 }
 
+bool passes(int threshold, int level)
+{
+    return threshold != 0 && level >= threshold;
+}
+
+/** Whether the line would be written; call with the mutex held. */
+bool acceptsLocked(const LoggerState& logger, Channel channel,
+                   const std::string& component, int level)
+{
+    const int threshold = channel == Channel::Log ? logger.settings.logLevel
+                                                  : logger.settings.traceLevel;
+    return passes(threshold, level) &&
+           lists(logger.settings.components, component) && logger.sink;
+}
+
 void emit(Channel channel, const char* function, const char* file, int line,
           const std::string& component, int level, const std::string& message)
 {
@@ -37,11 +59,7 @@ void emit(Channel channel, const char* function, const char* file, int line,
     std::shared_ptr<LogSink> sink;
     {
         const std::lock_guard lock(logger.mutex);
-        const int threshold = channel == Channel::Log
-                                  ? logger.settings.logLevel
-                                  : logger.settings.traceLevel;
-        if (threshold == 0 || level < threshold ||
-            !lists(logger.settings.components, component) || !logger.sink)
+        if (!acceptsLocked(logger, channel, component, level))
         {
             return;
         }
@@ -93,6 +111,7 @@ std::shared_ptr<LogSink> CVLogger::setSink(std::shared_ptr<LogSink> sink)
 {
     LoggerState& logger = state();
     const std::lock_guard lock(logger.mutex);
+    logger.hasSink.store(sink != nullptr, std::memory_order_relaxed);
     return std::exchange(logger.sink, std::move(sink));
 }
 
@@ -101,6 +120,8 @@ void CVLogger::configure(const LoggerSettings& settings)
     LoggerState& logger = state();
     const std::lock_guard lock(logger.mutex);
     logger.settings = settings;
+    logger.logThreshold.store(settings.logLevel, std::memory_order_relaxed);
+    logger.traceThreshold.store(settings.traceLevel, std::memory_order_relaxed);
 }
 
 LoggerSettings CVLogger::settings()
@@ -108,6 +129,22 @@ LoggerSettings CVLogger::settings()
     LoggerState& logger = state();
     const std::lock_guard lock(logger.mutex);
     return logger.settings;
+}
+
+bool CVLogger::writes(Channel channel, const std::string& component, int level)
+{
+    LoggerState& logger = state();
+    const int threshold =
+        channel == Channel::Log
+            ? logger.logThreshold.load(std::memory_order_relaxed)
+            : logger.traceThreshold.load(std::memory_order_relaxed);
+    if (!passes(threshold, level) ||
+        !logger.hasSink.load(std::memory_order_relaxed))
+    {
+        return false;
+    }
+    const std::lock_guard lock(logger.mutex);
+    return acceptsLocked(logger, channel, component, level);
 }
 
 CVMessageBuffer& CVMessageBuffer::operator<<(const char* text)

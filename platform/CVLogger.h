@@ -88,6 +88,13 @@ class CVLogger
     static std::shared_ptr<LogSink> setSink(std::shared_ptr<LogSink> sink);
     static void configure(const LoggerSettings& settings);
     static LoggerSettings settings();
+    /**
+     * Whether a line of @p component at @p level written to @p channel now
+     * would reach a sink. Lets callers skip formatting lines that nobody
+     * receives; the write calls decide again for themselves.
+     */
+    static bool writes(Channel channel, const std::string& component,
+                       int level);
 };
 
 /** A growable text buffer; str() hands out the text and empties it. */

@@ -320,9 +320,9 @@ class TreeReader
         }
     }
 
-    std::shared_ptr<const NodeTree> build() const
+    std::shared_ptr<const NodeTree> build() &&
     {
-        return builder_.build();
+        return std::move(builder_).build();
     }
 
   private:
@@ -451,7 +451,7 @@ std::shared_ptr<const NodeTree> parseFixture(std::istream& in,
     {
         throw FixtureError(sourceName + ": read error");
     }
-    return tree.build();
+    return std::move(tree).build();
 }
 
 std::shared_ptr<const NodeTree> loadFixtureFile(const std::string& path)

@@ -114,7 +114,7 @@ bool Instrumentation::setFilter(NodeLexicon::PathType type,
     return true;
 }
 
-std::string Instrumentation::getPathToNode() const
+const std::string& Instrumentation::getPathToNode() const
 {
     source_->beforeOperation(CursorOperation::GetPath);
     return currentOrThrow("getPathToNode").path;

@@ -44,7 +44,9 @@ class Instrumentation
     Instrumentation& operator++();
     bool setFilter(NodeLexicon::PathType type, const std::string& path);
 
-    std::string getPathToNode() const;
+    /** The current node's path, held by the cursor's snapshot: valid for
+     *  as long as the cursor lives. */
+    const std::string& getPathToNode() const;
     std::string getPathToParentNode() const;
     std::string convertPathToString(const std::string& path) const;
     std::string getNodeDescription() const;

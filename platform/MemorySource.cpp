@@ -91,7 +91,7 @@ MemorySource::clearLogsLocked(NodeTree::NodeId controller)
             .setStatus(logPath, NodeLexicon::EventLogStatusCleared);
         cleared.push_back(logPath);
     }
-    tree_ = builder.build();
+    tree_ = std::move(builder).build();
     return cleared;
 }
 
@@ -175,7 +175,7 @@ std::string MemorySource::appendEntry(const std::string& logPath,
             .setProperty(path, NodeLexicon::Timestamp, timestamp)
             .setProperty(path, NodeLexicon::RecordData, recordData)
             .setProperty(logPath, NodeLexicon::IsEmpty, false);
-        tree_ = builder.build();
+        tree_ = std::move(builder).build();
     }
     deliver({{path, NodeLexicon::AlertOnEventLogEntry}},
             NodeLexicon::EventLogEntry, DateTime::now());
@@ -402,7 +402,7 @@ void MemorySource::simulateLogStatus(unsigned status)
         logPath = tree_->node(firstLogLocked()).path;
         NodeTreeBuilder builder(*tree_);
         builder.setStatus(logPath, status);
-        tree_ = builder.build();
+        tree_ = std::move(builder).build();
     }
     deliver({{logPath, NodeLexicon::AlertOnEventLog}}, NodeLexicon::EventLog,
             DateTime::now());
@@ -425,7 +425,7 @@ void MemorySource::simulateRestart()
                 .addNode(NodeLexicon::Watchdog, watchdogPath, controllerPath,
                          "Watchdog", 1)
                 .setProperty(watchdogPath, NodeLexicon::RestartCause, 4u);
-            tree_ = builder.build();
+            tree_ = std::move(builder).build();
         }
         else
         {

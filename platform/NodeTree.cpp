@@ -220,24 +220,40 @@ bool NodeTreeBuilder::contains(const std::string& path) const
     return byPath_.find(path) != byPath_.end();
 }
 
-std::shared_ptr<const NodeTree> NodeTreeBuilder::build() const
+std::shared_ptr<const NodeTree> NodeTreeBuilder::build() const&
+{
+    return freeze(nodes_, byPath_);
+}
+
+std::shared_ptr<const NodeTree> NodeTreeBuilder::build() &&
+{
+    auto tree = freeze(std::move(nodes_), std::move(byPath_));
+    nodes_.clear();
+    byPath_.clear();
+    return tree;
+}
+
+std::shared_ptr<const NodeTree> NodeTreeBuilder::freeze(
+    std::vector<NodeRecord> nodes,
+    std::unordered_map<std::string, NodeTree::NodeId> byPath)
 {
     auto tree = std::make_shared<NodeTree>();
-    tree->nodes_ = nodes_;
-    tree->byPath_ = byPath_;
-    tree->positionStart_.reserve(nodes_.size() + 1);
-    for (std::size_t i = 0; i < nodes_.size(); ++i)
+    tree->nodes_ = std::move(nodes);
+    tree->byPath_ = std::move(byPath);
+    const std::vector<NodeRecord>& frozen = tree->nodes_;
+    tree->positionStart_.reserve(frozen.size() + 1);
+    for (std::size_t i = 0; i < frozen.size(); ++i)
     {
         const auto id = static_cast<NodeTree::NodeId>(i);
-        const unsigned kind = nodes_[i].kind;
+        const unsigned kind = frozen[i].kind;
         tree->positionStart_.push_back(
             static_cast<std::uint32_t>(tree->positions_.size()));
 
         auto& all = tree->lists_[NodeTree::listKey(kind, NodeTree::none)];
         tree->positions_.push_back(static_cast<std::uint32_t>(all.size()));
         all.push_back(id);
-        for (NodeTree::NodeId up = nodes_[i].parent; up != NodeTree::none;
-             up = nodes_[up].parent)
+        for (NodeTree::NodeId up = frozen[i].parent; up != NodeTree::none;
+             up = frozen[up].parent)
         {
             auto& list = tree->lists_[NodeTree::listKey(kind, up)];
             tree->positions_.push_back(static_cast<std::uint32_t>(list.size()));

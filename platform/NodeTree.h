@@ -117,10 +117,17 @@ class NodeTreeBuilder
                                  const std::string& ancestorPath);
     bool contains(const std::string& path) const;
 
-    std::shared_ptr<const NodeTree> build() const;
+    /** A tree of the nodes collected so far; the builder keeps them. */
+    std::shared_ptr<const NodeTree> build() const&;
+    /** The same, handing the collected nodes over instead of copying them
+     *  (the builder is left empty). */
+    std::shared_ptr<const NodeTree> build() &&;
 
   private:
     NodeRecord& at(const std::string& path);
+    static std::shared_ptr<const NodeTree>
+    freeze(std::vector<NodeRecord> nodes,
+           std::unordered_map<std::string, NodeTree::NodeId> byPath);
 
     std::vector<NodeRecord> nodes_;
     std::unordered_map<std::string, NodeTree::NodeId> byPath_;

@@ -139,6 +139,60 @@ TEST_F(LoggerTest, NullSinkDiscardsAndSetSinkReturnsThePrevious)
     EXPECT_TRUE(capture_->records().empty());
 }
 
+TEST_F(LoggerTest, WritesAnswersWhetherAChannelWouldWriteTheLine)
+{
+    configure(6000, 3000, {"Corvane.SELProvider"});
+    EXPECT_FALSE(CVLogger::writes(Channel::Log, "Corvane.SELProvider", 4000));
+    EXPECT_TRUE(CVLogger::writes(Channel::Log, "Corvane.SELProvider", 6000));
+    EXPECT_FALSE(CVLogger::writes(Channel::Trace, "Corvane.SELProvider", 2999));
+    EXPECT_TRUE(CVLogger::writes(Channel::Trace, "Corvane.SELProvider", 3000));
+    EXPECT_FALSE(CVLogger::writes(Channel::Log, "Unlisted", 6000));
+
+    configure(0, 1, {"*"});
+    EXPECT_FALSE(CVLogger::writes(Channel::Log, "c", 9000));
+    EXPECT_TRUE(CVLogger::writes(Channel::Trace, "c", 1));
+
+    CVLogger::setSink(nullptr);
+    EXPECT_FALSE(CVLogger::writes(Channel::Trace, "c", 1));
+    CVLogger::setSink(capture_);
+    EXPECT_TRUE(CVLogger::writes(Channel::Trace, "c", 1));
+    // Asking writes nothing.
+    EXPECT_TRUE(capture_->records().empty());
+}
+
+TEST_F(LoggerTest, WritesAgreesWithWhatTheChannelsWrite)
+{
+    const std::vector<std::string> components = {"a", "b"};
+    for (const int threshold : {0, 1, 3000, 4000, 6000})
+    {
+        configure(threshold, 6000 - threshold, {"a"});
+        for (const std::string& component : components)
+        {
+            for (const int level : {0, 1, 2999, 3000, 4000, 6000, 9000})
+            {
+                capture_->clear();
+                const bool logs =
+                    CVLogger::writes(Channel::Log, component, level);
+                const bool traces =
+                    CVLogger::writes(Channel::Trace, component, level);
+                log(component, level, "l");
+                trace(component, level, "t");
+                std::vector<std::string> expected;
+                if (logs)
+                {
+                    expected.emplace_back("l");
+                }
+                if (traces)
+                {
+                    expected.emplace_back("t");
+                }
+                EXPECT_EQ(messages(), expected)
+                    << threshold << ' ' << component << ' ' << level;
+            }
+        }
+    }
+}
+
 TEST_F(LoggerTest, NullFunctionAndFileBecomeEmpty)
 {
     configure(1, 1, {"*"});

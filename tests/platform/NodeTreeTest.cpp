@@ -3,6 +3,7 @@
 #include "platform/TestTrees.h"
 
 #include <stdexcept>
+#include <utility>
 
 #include <gtest/gtest.h>
 
@@ -112,6 +113,47 @@ TEST(NodeTree, PropertiesAreTypedAndReplaceable)
     EXPECT_EQ(log.find(MaxRecords), nullptr);
     EXPECT_EQ(log.status, 7u);
     EXPECT_EQ(log.description, "described");
+}
+
+TEST(NodeTreeBuilder, BuildingFromATemporaryGivesTheSameTree)
+{
+    const auto fill = [](NodeTreeBuilder& builder)
+    {
+        builder.addNode(ManagementController, "/bmc0", "", "BMC", 1)
+            .addNode(EventLog, "/bmc0/sel", "/bmc0", "SEL", 2)
+            .addNode(EventLogEntry, "/bmc0/sel/e1", "/bmc0/sel", "one", 0)
+            .addNode(EventLogEntry, "/bmc0/sel/e2", "/bmc0/sel", "two", 0)
+            .setProperty("/bmc0/sel/e2", RecordId, 2u)
+            .setProperty("/bmc0/sel", Name, std::string("SEL"));
+    };
+    NodeTreeBuilder kept;
+    fill(kept);
+    NodeTreeBuilder consumed;
+    fill(consumed);
+    const auto copied = kept.build();
+    const auto moved = std::move(consumed).build();
+
+    ASSERT_EQ(moved->size(), copied->size());
+    for (NodeTree::NodeId id = 0; id < copied->size(); ++id)
+    {
+        EXPECT_EQ(moved->node(id).path, copied->node(id).path);
+        EXPECT_EQ(moved->node(id).description, copied->node(id).description);
+        EXPECT_EQ(moved->node(id).parent, copied->node(id).parent);
+        EXPECT_EQ(moved->node(id).properties, copied->node(id).properties);
+        EXPECT_EQ(moved->find(copied->node(id).path), id);
+    }
+    const auto log = *moved->find("/bmc0/sel");
+    EXPECT_EQ(pathsOf(*moved, moved->nodesOfKind(EventLogEntry, log)),
+              (std::vector<std::string>{"/bmc0/sel/e1", "/bmc0/sel/e2"}));
+    EXPECT_EQ(moved->positionInList(*moved->find("/bmc0/sel/e2"), log), 1u);
+
+    // The builder that was copied from keeps its nodes; the one that was
+    // built from is left empty and usable.
+    EXPECT_TRUE(kept.contains("/bmc0/sel/e2"));
+    EXPECT_EQ(kept.build()->size(), copied->size());
+    EXPECT_FALSE(consumed.contains("/bmc0")); // NOLINT(bugprone-use-after-move)
+    consumed.addNode(ManagementController, "/bmc0", "", "again", 1);
+    EXPECT_EQ(consumed.build()->size(), 1u);
 }
 
 TEST(NodeTreeBuilder, RejectsDuplicatesUnknownParentsAndEmptyPaths)

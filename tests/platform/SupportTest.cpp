@@ -1,6 +1,12 @@
 #include "Support.h"
 
+#include <cerrno>
+#include <cstring>
+#include <sched.h>
+#include <string>
+#include <thread>
 #include <unistd.h>
+#include <vector>
 
 #include <gtest/gtest.h>
 
@@ -12,6 +18,82 @@ TEST(Support, SystemNameIsTheHostName)
     ASSERT_EQ(gethostname(expected, sizeof expected - 1), 0);
     EXPECT_EQ(getSystemName(), expected);
     EXPECT_FALSE(getSystemName().empty());
+}
+
+TEST(Support, SystemNameIsTheHostNameInsideAScopeToo)
+{
+    char expected[256] = {};
+    ASSERT_EQ(gethostname(expected, sizeof expected - 1), 0);
+    const SystemNameScope outer;
+    EXPECT_EQ(getSystemName(), expected);
+    {
+        const SystemNameScope inner;
+        EXPECT_EQ(getSystemName(), expected);
+    }
+    EXPECT_EQ(getSystemName(), expected);
+}
+
+namespace
+{
+
+/** What a thread in a UTS namespace of its own saw of getSystemName
+ *  while its host name changed. */
+struct RenamedHostView
+{
+    std::string skipped; // why the check could not run, if it could not
+    std::vector<std::string> seen;
+};
+
+RenamedHostView renameHostWhileScoped()
+{
+    RenamedHostView view;
+    // Only this thread moves to a new UTS namespace, so renaming the host
+    // there leaves the machine's name alone.
+    if (unshare(CLONE_NEWUTS) != 0)
+    {
+        view.skipped =
+            std::string("no UTS namespace of our own: ") + std::strerror(errno);
+        return view;
+    }
+    const auto rename = [](const char* name)
+    { return sethostname(name, std::strlen(name)) == 0; };
+    if (!rename("scope-first"))
+    {
+        view.skipped = "sethostname refused";
+        return view;
+    }
+    {
+        const SystemNameScope scope;
+        view.seen.push_back(getSystemName());
+        rename("scope-second");
+        view.seen.push_back(getSystemName());
+        {
+            const SystemNameScope nested;
+            rename("scope-third");
+            view.seen.push_back(getSystemName());
+        }
+    }
+    view.seen.push_back(getSystemName());
+    rename("scope-fourth");
+    view.seen.push_back(getSystemName());
+    return view;
+}
+
+} // namespace
+
+TEST(Support, AScopeReadsTheSystemNameOnceAndTheNextCallReadsAgain)
+{
+    RenamedHostView view;
+    std::thread([&] { view = renameHostWhileScoped(); }).join();
+    if (!view.skipped.empty())
+    {
+        GTEST_SKIP() << view.skipped;
+    }
+    // Within the scope (and the one nested in it) the first name stays;
+    // after it, each call reads the name again.
+    EXPECT_EQ(view.seen, (std::vector<std::string>{"scope-first", "scope-first",
+                                                   "scope-first", "scope-third",
+                                                   "scope-fourth"}));
 }
 
 TEST(Support, StripSpacesRemovesSurroundingBlanksOnly)

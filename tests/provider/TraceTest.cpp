@@ -132,6 +132,14 @@ TEST(TraceHeader, PathEndsInTheTraceHeader)
 
 class MarkingTest : public PlatformTest
 {
+  protected:
+    static void setLevels(int logLevel, int traceLevel)
+    {
+        CVLog::LoggerSettings settings;
+        settings.logLevel = logLevel;
+        settings.traceLevel = traceLevel;
+        CVLog::CVLogger::configure(settings);
+    }
 };
 
 TEST_F(MarkingTest, EntryMarkingMakesFourLoggerCallsAtLevel4000)
@@ -201,6 +209,47 @@ TEST_F(MarkingTest, ErrorLineGoesToBothChannelsAt6000)
         EXPECT_EQ(record.file, "SELProvider.cpp");
         EXPECT_EQ(record.line, 120);
     }
+}
+
+TEST_F(MarkingTest, EachChannelThatWritesGetsTheLineFormattedAfresh)
+{
+    setLevels(4000, 4000);
+    int formatted = 0;
+    QX::logAndTrace("fn", "SEL.cpp", 5, "Corvane.SELProvider", 4000,
+                    [&]
+                    {
+                        ++formatted;
+                        return formatted == 1 ? "first" : "second";
+                    });
+    EXPECT_EQ(formatted, 2);
+    const auto records = logRecords();
+    ASSERT_EQ(records.size(), 2u);
+    EXPECT_EQ(records[0].channel, CVLog::Channel::Log);
+    EXPECT_EQ(records[0].message, "first");
+    EXPECT_EQ(records[1].channel, CVLog::Channel::Trace);
+    EXPECT_EQ(records[1].message, "second");
+}
+
+TEST_F(MarkingTest, LinesThatNoChannelWritesAreNotFormatted)
+{
+    setLevels(6000, 0);
+    int formatted = 0;
+    const auto format = [&]
+    {
+        ++formatted;
+        return "line";
+    };
+    QX::logAndTrace("fn", "SEL.cpp", 5, "Corvane.SELProvider", 4000, format);
+    EXPECT_EQ(formatted, 0);
+    EXPECT_TRUE(logRecords().empty());
+
+    // A failure still reaches the log channel, and only that one.
+    QX::logAndTrace("fn", "SEL.cpp", 6, "Corvane.SELProvider", 6000, format);
+    EXPECT_EQ(formatted, 1);
+    const auto records = logRecords();
+    ASSERT_EQ(records.size(), 1u);
+    EXPECT_EQ(records[0].channel, CVLog::Channel::Log);
+    EXPECT_EQ(records[0].message, "line");
 }
 
 TEST(ProviderExceptionTest, WhatReturnsTheText)

@@ -137,21 +137,32 @@ inline const char* trace(const char* name, const char* file, unsigned line,
  *        level, with the same location, component and level.
  *
  * @p format is called once per channel and returns the formatted line, so
- * each channel gets the line as freshly formatted.
+ * each channel gets the line as freshly formatted. A channel that would
+ * write nothing for this component and level gets no call: the line is not
+ * formatted for it at all, which keeps routine lines nearly free while
+ * their level is switched off.
  */
 template <typename Format>
 void logAndTrace(const char* function, const char* file, int line,
                  const std::string& component, int level, const Format& format)
 {
+    using CVLog::Channel;
+    using CVLog::CVLogger;
     CVLog::CVMessageBuffer buffer;
-    buffer << format();
-    CVLog::CVLogger::logLevelMessage(function, file, line, component, level,
-                                     nullptr, 0, 0,
-                                     CVLog::CVMessageBuffer::str(buffer));
-    buffer << format();
-    CVLog::CVLogger::traceLevelMessage(function, file, line, component, level,
-                                       nullptr, 0, 0,
-                                       CVLog::CVMessageBuffer::str(buffer));
+    if (CVLogger::writes(Channel::Log, component, level))
+    {
+        buffer << format();
+        CVLogger::logLevelMessage(function, file, line, component, level,
+                                  nullptr, 0, 0,
+                                  CVLog::CVMessageBuffer::str(buffer));
+    }
+    if (CVLogger::writes(Channel::Trace, component, level))
+    {
+        buffer << format();
+        CVLogger::traceLevelMessage(function, file, line, component, level,
+                                    nullptr, 0, 0,
+                                    CVLog::CVMessageBuffer::str(buffer));
+    }
 }
 
 /** Logs and traces a MESSAGE line with @p text. */
