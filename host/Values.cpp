@@ -171,7 +171,12 @@ std::string Value::toString() const
         case CMPI_ref:
             return ref() ? quoted(ref()->toString()) : "NULL";
         default:
-            return "<" + typeName(type) + ">";
+        {
+            std::string out = "<";
+            out += typeName(type);
+            out += '>';
+            return out;
+        }
     }
 }
 
