@@ -91,12 +91,6 @@ Arena::~Arena()
     clear();
 }
 
-void Arena::adopt(std::unique_ptr<Object> object)
-{
-    const std::lock_guard lock(mutex_);
-    objects_.push_back(std::move(object));
-}
-
 std::size_t Arena::size() const
 {
     const std::lock_guard lock(mutex_);
@@ -105,14 +99,15 @@ std::size_t Arena::size() const
 
 void Arena::clear()
 {
-    std::vector<std::unique_ptr<Object>> doomed;
+    std::vector<Object*> doomed;
     {
         const std::lock_guard lock(mutex_);
         doomed.swap(objects_);
     }
-    while (!doomed.empty())
+    // Newest first, as a request's objects were freed before.
+    for (auto it = doomed.rbegin(); it != doomed.rend(); ++it)
     {
-        doomed.pop_back();
+        std::destroy_at(*it);
     }
 }
 

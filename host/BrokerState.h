@@ -57,10 +57,7 @@ struct BrokerState
     template <typename T>
     T* make()
     {
-        auto object = std::make_unique<T>(*this);
-        T* raw = object.get();
-        currentArena().adopt(std::move(object));
-        return raw;
+        return currentArena().template make<T>(*this);
     }
     // A new object that lives until release() or the broker's end.
     template <typename T>
