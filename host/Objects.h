@@ -100,7 +100,7 @@ struct DateTimeObject : Encapsulated<CMPIDateTime, CMPIDateTimeFT, &dateTimeFT>
     {
         return from<DateTimeObject>(d);
     }
-    std::string text;
+    Text text; // CIM datetime text
 };
 
 struct ObjectPathObject :

@@ -49,7 +49,7 @@ Value Value::real(CMPIType type, double value)
     return v;
 }
 
-Value Value::string(std::string value)
+Value Value::string(Text value)
 {
     Value v;
     v.type = CMPI_string;
@@ -57,7 +57,7 @@ Value Value::string(std::string value)
     return v;
 }
 
-Value Value::dateTime(std::string cimText)
+Value Value::dateTime(Text cimText)
 {
     Value v;
     v.type = CMPI_dateTime;
@@ -116,9 +116,9 @@ double Value::realValue() const
     return scalarOf<double>(payload_);
 }
 
-const std::string& Value::text() const
+std::string_view Value::text() const
 {
-    return objectOf<std::string>(payload_);
+    return objectOf<Text>(payload_);
 }
 
 const std::vector<Value>& Value::elements() const

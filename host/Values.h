@@ -1,5 +1,7 @@
 #pragma once
 
+#include "Text.h"
+
 #include <cmpidt.h>
 
 #include <atomic>
@@ -31,7 +33,7 @@ struct Value
     std::uint64_t unsignedValue() const; // unsigned, char16, boolean (0/1)
     std::int64_t signedValue() const;
     double realValue() const;
-    const std::string& text() const; // CMPI_string, CMPI_dateTime text
+    std::string_view text() const; // CMPI_string, CMPI_dateTime text
     const std::vector<Value>& elements() const; // arrays
     const std::shared_ptr<ObjectPath>& ref() const;
 
@@ -47,7 +49,7 @@ struct Value
     {
         payload_ = value;
     }
-    void setText(std::string value)
+    void setText(Text value)
     {
         payload_ = std::move(value);
     }
@@ -73,14 +75,14 @@ struct Value
     static Value unsignedInt(CMPIType type, std::uint64_t value);
     static Value signedInt(CMPIType type, std::int64_t value);
     static Value real(CMPIType type, double value);
-    static Value string(std::string value);
-    static Value dateTime(std::string cimText);
+    static Value string(Text value);
+    static Value dateTime(Text cimText);
     static Value reference(ObjectPath path);
     static Value array(CMPIType elementType, std::vector<Value> elements);
 
   private:
     std::variant<std::monostate, std::uint64_t, std::int64_t, double,
-                 std::string, std::vector<Value>, std::shared_ptr<ObjectPath>>
+                 Text, std::vector<Value>, std::shared_ptr<ObjectPath>>
         payload_;
 };
 

@@ -118,7 +118,7 @@ TEST_F(IndicationDelivery, AlertsOneAfterAnotherAreEachDeliveredInOrder)
     {
         const auto indication = next();
         ASSERT_TRUE(indication.has_value()) << "after " << i;
-        delivered.push_back(
+        delivered.emplace_back(
             indication->instance.property("IndicationIdentifier")->text());
     }
     settle();

@@ -313,8 +313,8 @@ TEST_F(IndicationProperties, RecordIdsAreDecimalWithoutPadding)
                            alertTime);
         const auto delivered = next();
         ASSERT_TRUE(delivered.has_value());
-        const std::string element =
-            delivered->instance.property("AlertingManagedElement")->text();
+        const std::string element(
+            delivered->instance.property("AlertingManagedElement")->text());
         EXPECT_NE(element.find("RecordID=\"" + std::to_string(id) + "\""),
                   std::string::npos)
             << element;

@@ -17,7 +17,7 @@ TEST_F(ResultStreamTest, HandlersReceiveResultsInOrderInsteadOfTheOutcome)
     std::vector<std::string> seen;
     host::ResultHandlers handlers;
     handlers.instance = [&](const host::Instance& i)
-    { seen.push_back("instance " + i.property("X")->text()); };
+    { seen.push_back("instance " + std::string(i.property("X")->text())); };
     handlers.path = [&](const host::ObjectPath& p)
     { seen.push_back("path " + p.className); };
     request_->streamTo(&handlers);

@@ -163,7 +163,7 @@ unsigned BmcTest::ipmitoolEntries() const
 std::string text(const host::Instance& instance, const std::string& name)
 {
     const host::Value* value = instance.property(name);
-    return value != nullptr ? value->text() : std::string();
+    return value != nullptr ? std::string(value->text()) : std::string();
 }
 
 std::uint64_t number(const host::Instance& instance, const std::string& name)

@@ -74,7 +74,7 @@ std::string textOf(const host::Instance& instance, const char* name)
     {
         return "<missing or not a string>";
     }
-    return value->text();
+    return std::string(value->text());
 }
 
 } // namespace
