@@ -74,6 +74,18 @@ class Text
     {
         return a.view() == b;
     }
+    friend std::string operator+(std::string left, const Text& right)
+    {
+        return left.append(right.view());
+    }
+    friend std::string operator+(const char* left, const Text& right)
+    {
+        return std::string(left).append(right.view());
+    }
+    friend std::string operator+(const Text& left, std::string_view right)
+    {
+        return left.str().append(right);
+    }
     friend std::ostream& operator<<(std::ostream& out, const Text& text)
     {
         return out << text.view();

@@ -227,7 +227,7 @@ const Value* findNamed(const NamedValues& values, std::string_view name)
     return nullptr;
 }
 
-void setNamed(NamedValues& values, std::string name, Value value)
+void setNamed(NamedValues& values, Text name, Value value)
 {
     for (auto& [n, v] : values)
     {
@@ -315,7 +315,7 @@ const Value* ObjectPath::key(std::string_view name) const
     return findNamed(keys.list(), name);
 }
 
-void ObjectPath::setKey(std::string name, Value value)
+void ObjectPath::setKey(Text name, Value value)
 {
     setNamed(keys.edit(), std::move(name), std::move(value));
 }
@@ -331,7 +331,7 @@ const Value* Instance::property(std::string_view name) const
     return findNamed(properties.list(), name);
 }
 
-void Instance::setProperty(std::string name, Value value)
+void Instance::setProperty(Text name, Value value)
 {
     setNamed(properties.edit(), std::move(name), std::move(value));
 }
@@ -342,7 +342,7 @@ std::vector<std::string> Instance::propertyNames() const
     names.reserve(properties.size());
     for (const auto& [n, v] : properties)
     {
-        names.push_back(n);
+        names.emplace_back(n);
     }
     return names;
 }

@@ -86,12 +86,12 @@ struct Value
         payload_;
 };
 
-using NamedValues = std::vector<std::pair<std::string, Value>>;
+using NamedValues = std::vector<std::pair<Text, Value>>;
 
 // Case-insensitive lookup in a list of named values; nullptr if absent.
 const Value* findNamed(const NamedValues& values, std::string_view name);
 // Replaces a value of the same name in place, or appends a new one.
-void setNamed(NamedValues& values, std::string name, Value value);
+void setNamed(NamedValues& values, Text name, Value value);
 
 // A list of named values that copies share until one of them changes it.
 // The instance a provider builds and every copy the broker takes of it (a
@@ -161,7 +161,7 @@ struct ObjectPath
     SharedNamedValues keys; // in insertion order
 
     const Value* key(std::string_view name) const;
-    void setKey(std::string name, Value value);
+    void setKey(Text name, Value value);
     // WBEM text: [//host/]ns:Class.K1="v1",K2=7 with keys sorted by name.
     std::string toString() const;
     // Throws std::invalid_argument on malformed text. With a schema, keys
@@ -176,7 +176,7 @@ struct Instance
     ObjectPath path;              // as the broker's getObjectPath returns it
     SharedNamedValues properties; // in the order first set
     const Value* property(std::string_view name) const;
-    void setProperty(std::string name, Value value);
+    void setProperty(Text name, Value value);
     std::vector<std::string> propertyNames() const;
 };
 

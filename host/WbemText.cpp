@@ -391,7 +391,7 @@ std::string ObjectPath::toString() const
         out += nameSpace + ":";
     }
     out += className;
-    std::vector<const std::pair<std::string, Value>*> sorted;
+    std::vector<const NamedValues::value_type*> sorted;
     for (const auto& k : keys)
     {
         sorted.push_back(&k);

@@ -54,7 +54,7 @@ std::string baseTypeName(CMPIType type)
     }
 }
 
-bool contains(const std::vector<std::string>& names, const std::string& name)
+bool contains(const std::vector<std::string>& names, std::string_view name)
 {
     return std::any_of(names.begin(), names.end(),
                        [&](const std::string& n)
@@ -112,7 +112,7 @@ std::vector<std::string> keyMismatches(const mof::ClassRepository& classes,
     std::vector<std::string> given;
     for (const auto& [name, value] : path.keys)
     {
-        given.push_back(name);
+        given.emplace_back(name);
         if (!contains(keys, name))
         {
             problems.push_back(path.className + ": " + name +
