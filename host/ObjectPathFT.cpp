@@ -21,7 +21,7 @@ CMPIObjectPath* opClone(const CMPIObjectPath* op, CMPIStatus* rc)
 }
 
 CMPIStatus setText(CMPIObjectPath* op, const char* text,
-                   std::string ObjectPath::*member)
+                   Text ObjectPath::*member)
 {
     Op* p = Op::of(op);
     if (p == nullptr)
@@ -39,7 +39,7 @@ CMPIStatus setText(CMPIObjectPath* op, const char* text,
 // getNameSpace, getHostname, getClassName: a new string, with the faults
 // planned for the call (if any).
 CMPIString* getText(const CMPIObjectPath* op, CMPIStatus* rc,
-                    std::string ObjectPath::*member,
+                    Text ObjectPath::*member,
                     std::optional<BrokerCall> call)
 {
     const Op* p = Op::of(op);

@@ -155,9 +155,9 @@ class SharedNamedValues
 
 struct ObjectPath
 {
-    std::string nameSpace;
-    std::string className;
-    std::string host;
+    Text nameSpace;
+    Text className;
+    Text host;
     SharedNamedValues keys; // in insertion order
 
     const Value* key(std::string_view name) const;

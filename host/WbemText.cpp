@@ -106,7 +106,7 @@ class PathParser
         if (colon != std::string_view::npos &&
             (stop == std::string_view::npos || colon < stop))
         {
-            path.nameSpace = std::string(text_.substr(pos_, colon - pos_));
+            path.nameSpace = text_.substr(pos_, colon - pos_);
             checkNameSpace(path.nameSpace);
             pos_ = colon + 1;
         }
@@ -162,7 +162,7 @@ class PathParser
         ++pos_;
     }
 
-    void checkNameSpace(const std::string& ns) const
+    void checkNameSpace(std::string_view ns) const
     {
         const bool ok = !ns.empty() && ns.front() != '/' && ns.back() != '/' &&
                         std::all_of(ns.begin(), ns.end(),
@@ -175,7 +175,7 @@ class PathParser
                                     });
         if (!ok)
         {
-            fail("bad namespace \"" + ns + "\"");
+            fail("bad namespace \"" + std::string(ns) + "\"");
         }
     }
 

@@ -177,7 +177,7 @@ TEST_F(IndicationLifetime, EverythingAtOnceFromSeveralThreads)
     EXPECT_LE(delivered.size(), static_cast<std::size_t>(raised.load()));
     for (const auto& indication : delivered)
     {
-        const std::string& className = indication.instance.path.className;
+        const std::string_view className = indication.instance.path.className;
         EXPECT_TRUE(className == entryEvent || className == restartEvent ||
                     className == clearEvent || className == fullEvent)
             << className;

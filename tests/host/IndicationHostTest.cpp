@@ -256,7 +256,7 @@ TEST_F(InboxTest, EachInboxGetsTheIndicationsOfItsNamespaceInOrder)
     std::vector<std::string> order;
     while (auto next = zanqx.next(0ms))
     {
-        order.push_back(next->instance.path.className);
+        order.emplace_back(next->instance.path.className);
         EXPECT_EQ(next->nameSpace, "root/zanqx");
     }
     EXPECT_EQ(order, (std::vector<std::string>{"First", "Second", "Third"}));
