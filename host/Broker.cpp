@@ -125,7 +125,7 @@ std::size_t Broker::brokerOwnedObjects() const
 }
 
 Broker::Request::Request(Broker& broker) :
-    state_(*broker.state_), arena_(std::make_unique<Arena>())
+    state_(*broker.state_), arena_(std::make_unique<Arena>(&state_.arenaBlocks))
 {
     state_.pushScope(arena_.get(), nullptr);
     context_ = state_.make<ContextObject>();

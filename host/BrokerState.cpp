@@ -243,7 +243,7 @@ CMPIStatus BrokerState::attach(const CMPIContext* ctx)
     Arena* arena = nullptr;
     {
         const std::lock_guard lock(attachMutex);
-        arena = &attachArenas.emplace_back();
+        arena = &attachArenas.emplace_back(&arenaBlocks);
     }
     if (!scopes.push({this, arena, ctx}))
     {

@@ -2,6 +2,7 @@
 // CMPIBroker handle and through every object's back pointer.
 #pragma once
 
+#include "BlockCache.h"
 #include "Faults.h"
 #include "Objects.h"
 #include "Schema.h"
@@ -129,10 +130,16 @@ struct BrokerState
     mutable std::mutex ownedMutex;
     std::map<Object*, std::unique_ptr<Object>> owned;
 
+    // The arena blocks kept between requests: enough for the objects of
+    // an enumeration of the largest log (65,535 entries) and then some.
+    static constexpr std::size_t arenaBlockLimit = std::size_t{128} << 20;
+    // Above the arenas, which give their blocks back to it.
+    BlockCache arenaBlocks{arenaBlockLimit};
+
     mutable std::mutex attachMutex;
     std::list<Arena> attachArenas;
 
-    Arena brokerArena;
+    Arena brokerArena{&arenaBlocks};
 };
 
 // Hands a freshly made object to the provider, applying a planned fault:

@@ -39,8 +39,7 @@ CMPIStatus setText(CMPIObjectPath* op, const char* text,
 // getNameSpace, getHostname, getClassName: a new string, with the faults
 // planned for the call (if any).
 CMPIString* getText(const CMPIObjectPath* op, CMPIStatus* rc,
-                    Text ObjectPath::*member,
-                    std::optional<BrokerCall> call)
+                    Text ObjectPath::*member, std::optional<BrokerCall> call)
 {
     const Op* p = Op::of(op);
     if (p == nullptr)

@@ -189,7 +189,11 @@ struct SelectExpObject :
 class Arena
 {
   public:
-    Arena() = default;
+    explicit Arena(
+        std::pmr::memory_resource* blocks = std::pmr::new_delete_resource()) :
+        memory_(blocks)
+    {
+    }
     ~Arena();
     Arena(const Arena&) = delete;
     Arena& operator=(const Arena&) = delete;

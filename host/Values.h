@@ -81,8 +81,8 @@ struct Value
     static Value array(CMPIType elementType, std::vector<Value> elements);
 
   private:
-    std::variant<std::monostate, std::uint64_t, std::int64_t, double,
-                 Text, std::vector<Value>, std::shared_ptr<ObjectPath>>
+    std::variant<std::monostate, std::uint64_t, std::int64_t, double, Text,
+                 std::vector<Value>, std::shared_ptr<ObjectPath>>
         payload_;
 };
 
