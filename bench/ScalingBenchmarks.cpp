@@ -8,6 +8,14 @@
 // with the allocation counter off.
 // A request whose cost per entry stays flat as the log grows is linear;
 // bench/scaling.sh prints the ratios between the sizes.
+//
+// HeapReplayEnumerate records every allocation and free of one
+// EnumerateInstances and times them again with malloc and free alone, each
+// block written in full: the cost of the request's heap traffic on this
+// machine without the request's work. Its ratio is how much of the growth
+// per entry the allocator and the memory system give by themselves.
+// HeapReplayArena places the same blocks one after the other in a region
+// kept between requests and frees nothing, as an arena per request would.
 #include "AllocationCounter.h"
 #include "CVLogger.h"
 #include "Fixture.h"
@@ -75,6 +83,41 @@ void measure(benchmark::State& state, std::size_t expected,
         static_cast<double>(after.peakLiveBytes - before.liveBytes) / entries);
 }
 
+// Records the heap operations of one run of @p request and times @p replay
+// of them; the counters are those of measure().
+void measureHeapReplay(benchmark::State& state,
+                       const std::function<std::size_t()>& request,
+                       void (*replay)(const bench::HeapRecording&))
+{
+    const auto entries = static_cast<double>(state.range(0));
+    request();
+    // Generously more than the 100 or so operations a request makes per
+    // entry; a recording that overflows is reported, not replayed.
+    bench::startRecording(static_cast<std::size_t>(entries) * 400 + 100000);
+    request();
+    bench::HeapRecording recording;
+    if (!bench::stopRecording(recording))
+    {
+        state.SkipWithError("the request made more heap operations than "
+                            "the recording holds");
+        return;
+    }
+    replay(recording);
+    bench::countAllocations(false);
+    for (auto _ : state)
+    {
+        replay(recording);
+    }
+    bench::countAllocations(true);
+    using benchmark::Counter;
+    state.counters["per_entry"] =
+        Counter(entries, Counter::kIsIterationInvariantRate | Counter::kInvert);
+    state.counters["bytes_per_entry"] =
+        Counter(static_cast<double>(recording.allocatedBytes) / entries);
+    state.counters["peak_bytes_per_entry"] =
+        Counter(static_cast<double>(recording.peakLiveBytes) / entries);
+}
+
 // Runs @p run with a host on a generated log of state.range(0) entries.
 template <typename Run>
 void onGeneratedLog(benchmark::State& state, const Run& run)
@@ -130,6 +173,32 @@ void BM_ScalingGetInstance(benchmark::State& state)
         });
 }
 
+void heapReplayOfEnumeration(benchmark::State& state,
+                             void (*replay)(const bench::HeapRecording&))
+{
+    onGeneratedLog(state,
+                   [&](host::Host& host, unsigned)
+                   {
+                       measureHeapReplay(
+                           state,
+                           [&] {
+                               return host.enumerateInstances(entryClass())
+                                   .instances.size();
+                           },
+                           replay);
+                   });
+}
+
+void BM_ScalingHeapReplayEnumerate(benchmark::State& state)
+{
+    heapReplayOfEnumeration(state, bench::replay);
+}
+
+void BM_ScalingHeapReplayArena(benchmark::State& state)
+{
+    heapReplayOfEnumeration(state, bench::replayIntoArena);
+}
+
 void logSizes(benchmark::internal::Benchmark* b)
 {
     b->Arg(1000)->Arg(8192)->Arg(65535)->Unit(benchmark::kMillisecond);
@@ -138,5 +207,7 @@ void logSizes(benchmark::internal::Benchmark* b)
 BENCHMARK(BM_ScalingEnumerateInstances)->Apply(logSizes);
 BENCHMARK(BM_ScalingEnumerateInstanceNames)->Apply(logSizes);
 BENCHMARK(BM_ScalingGetInstance)->Apply(logSizes);
+BENCHMARK(BM_ScalingHeapReplayEnumerate)->Apply(logSizes);
+BENCHMARK(BM_ScalingHeapReplayArena)->Apply(logSizes);
 
 } // namespace

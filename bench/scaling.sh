@@ -24,6 +24,8 @@ fi
     }
     {
         gsub(/"/, "", $1)
+        # With --benchmark_repetitions, the median of each stands for it.
+        if ($1 ~ /_(mean|stddev|cv)$/) next
         split($1, part, "/")
         request = part[1]; sub(/^BM_Scaling/, "", request)
         size = part[2] + 0
