@@ -124,6 +124,11 @@ std::size_t Broker::brokerOwnedObjects() const
     return state_->brokerArena.size();
 }
 
+std::size_t Broker::cachedArenaBytes() const
+{
+    return state_->arenaBlocks.cachedBytes();
+}
+
 Broker::Request::Request(Broker& broker) :
     state_(*broker.state_), arena_(std::make_unique<Arena>(&state_.arenaBlocks))
 {

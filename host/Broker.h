@@ -71,6 +71,8 @@ class Broker
     std::size_t outstandingPreparedContexts() const;
     // Objects made outside any request or attachment.
     std::size_t brokerOwnedObjects() const;
+    // Memory that finished requests left for the next one's objects.
+    std::size_t cachedArenaBytes() const;
 
     // One provider operation: a context and a result, and the scope that
     // owns every object made on this thread until it is destroyed. Must be
