@@ -6,6 +6,9 @@
 #
 #   bench/scaling.sh [path/to/selprov_bench] [extra benchmark options]
 #
+# On a busy machine, add --benchmark_repetitions=3
+# --benchmark_report_aggregates_only=true: the medians are printed.
+#
 # Build the benchmarks optimised first: cmake --preset release &&
 # cmake --build --preset release --target selprov_bench
 set -eu
