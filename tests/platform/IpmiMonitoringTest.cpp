@@ -6,6 +6,7 @@
 #include "CVLogger.h"
 #include "ipmi/AlertState.h"
 #include "ipmi/IpmiSource.h"
+#include "platform/CapturedLog.h"
 #include "platform/FakeBmc.h"
 
 #include <atomic>
@@ -75,7 +76,6 @@ class IpmiMonitoringTest : public ::testing::Test
             gate.inside = false;
             gate.open = false;
         }
-        previousSink_ = CVLog::CVLogger::setSink(capture);
         CVLog::LoggerSettings everything;
         everything.logLevel = 1;
         CVLog::CVLogger::configure(everything);
@@ -93,7 +93,6 @@ class IpmiMonitoringTest : public ::testing::Test
         gate.changed.notify_all();
         source.reset();
         std::filesystem::remove_all(directory);
-        CVLog::CVLogger::setSink(previousSink_);
         CVLog::CVLogger::configure(CVLog::LoggerSettings{});
     }
 
@@ -134,14 +133,10 @@ class IpmiMonitoringTest : public ::testing::Test
         return true;
     }
 
+    QX::test::CapturedLog captured;
     std::filesystem::path directory;
     std::string stateFile;
     std::shared_ptr<IpmiSource> source;
-    std::shared_ptr<CVLog::CaptureSink> capture =
-        std::make_shared<CVLog::CaptureSink>();
-
-  private:
-    std::shared_ptr<CVLog::LogSink> previousSink_;
 };
 
 TEST_F(IpmiMonitoringTest, FirstRegistrationStartsThePollerLastStopsIt)
@@ -208,7 +203,7 @@ TEST_F(IpmiMonitoringTest, KeepsWhatItAnnouncedInTheStateFile)
     // Nothing old is announced without a state file.
     EXPECT_EQ(calls.load(), 0u);
     bool logged = false;
-    for (const auto& record : capture->records())
+    for (const auto& record : captured.records())
     {
         logged = logged ||
                  record.message.find("No alert state") != std::string::npos;

@@ -1,6 +1,7 @@
 #include "CVLogger.h"
 #include "Platform.h"
 #include "ipmi/IpmiSourceFactory.h"
+#include "platform/CapturedLog.h"
 #include "platform/ConfigurationFiles.h"
 
 #include <cstdio>
@@ -41,30 +42,18 @@ std::string refusal(const std::string& configurationText,
 class IpmiSettingsTest : public ::testing::Test
 {
   protected:
-    void SetUp() override
-    {
-        previous_ = CVLog::CVLogger::setSink(capture);
-    }
-    void TearDown() override
-    {
-        CVLog::CVLogger::setSink(previous_);
-    }
     /** Every logged line, for checks that the password is not among them. */
     std::string logged() const
     {
         std::string all;
-        for (const auto& record : capture->records())
+        for (const auto& record : captured.records())
         {
             all += record.message + "\n";
         }
         return all;
     }
 
-    std::shared_ptr<CVLog::CaptureSink> capture =
-        std::make_shared<CVLog::CaptureSink>();
-
-  private:
-    std::shared_ptr<CVLog::LogSink> previous_;
+    QX::test::CapturedLog captured;
 };
 
 TEST_F(IpmiSettingsTest, EveryKeyIsParsed)

@@ -2,6 +2,7 @@
 
 #include "CVLogger.h"
 #include "Instrumentation.h"
+#include "platform/CapturedLog.h"
 #include "platform/FakeBmc.h"
 
 #include <atomic>
@@ -27,15 +28,6 @@ void ignoreAlert(unsigned, DateTime, std::string, const void*) {}
 class IpmiSourceTest : public ::testing::Test
 {
   protected:
-    void SetUp() override
-    {
-        previousSink_ = CVLog::CVLogger::setSink(capture);
-    }
-    void TearDown() override
-    {
-        CVLog::CVLogger::setSink(previousSink_);
-    }
-
     // The source owns its BMC; the test keeps a pointer to steer it.
     void make(const Settings& settings = {})
     {
@@ -71,14 +63,10 @@ class IpmiSourceTest : public ::testing::Test
         return result;
     }
 
+    QX::test::CapturedLog captured;
     std::vector<Ipmi::SelRecordBytes> initial;
     FakeBmc* bmc = nullptr;
     std::shared_ptr<IpmiSource> source;
-    std::shared_ptr<CVLog::CaptureSink> capture =
-        std::make_shared<CVLog::CaptureSink>();
-
-  private:
-    std::shared_ptr<CVLog::LogSink> previousSink_;
 };
 
 TEST_F(IpmiSourceTest, TreeHasControllerLogEntriesAndWatchdog)
@@ -259,7 +247,7 @@ TEST_F(IpmiSourceTest, FailedClearThrowsTheIpmiError)
                          "session timeout");
     EXPECT_THROW(source->writeProperty("/bmc0", Command, 9), IpmiError);
     // The failure is logged with its category.
-    const auto records = capture->records();
+    const auto records = captured.records();
     ASSERT_FALSE(records.empty());
     EXPECT_EQ(records.back().level, 6000);
     EXPECT_EQ(records.back().message,
