@@ -203,10 +203,11 @@ CMPIArray* newArray(const CMPIBroker* mb, CMPICount max, CMPIType type,
     return deliver(a, fault, rc);
 }
 
-CMPIDateTime* makeDateTime(BrokerState& b, std::string text, CMPIStatus* rc)
+CMPIDateTime* makeDateTime(BrokerState& b, std::string_view text,
+                           CMPIStatus* rc)
 {
     auto* d = b.make<DateTimeObject>();
-    d->text = std::move(text);
+    d->text = text;
     setStatus(rc, CMPI_RC_OK);
     return &d->cmpi;
 }
@@ -237,7 +238,7 @@ CMPIDateTime* newDateTimeFromBinary(const CMPIBroker* mb, CMPIUint64 binTime,
         setStatus(rc, CMPI_RC_ERR_INVALID_PARAMETER);
         return nullptr;
     }
-    return makeDateTime(*b, std::move(*text), rc);
+    return makeDateTime(*b, *text, rc);
 }
 
 CMPIDateTime* newDateTimeFromChars(const CMPIBroker* mb, const char* utcTime,

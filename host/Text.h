@@ -70,9 +70,23 @@ class Text
         return size() == 0;
     }
 
+    // One for each kind of text it meets, so that no comparison needs a
+    // conversion to choose between them.
+    friend bool operator==(const Text& a, const Text& b) noexcept
+    {
+        return a.view() == b.view();
+    }
     friend bool operator==(const Text& a, std::string_view b) noexcept
     {
         return a.view() == b;
+    }
+    friend bool operator==(const Text& a, const std::string& b) noexcept
+    {
+        return a.view() == b;
+    }
+    friend bool operator==(const Text& a, const char* b) noexcept
+    {
+        return b != nullptr && a.view() == b;
     }
     friend std::string operator+(std::string left, const Text& right)
     {
