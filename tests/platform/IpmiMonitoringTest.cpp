@@ -24,9 +24,7 @@
 using namespace QX;
 using namespace QX::Ipmi;
 using namespace QX::NodeLexicon;
-using QX::test::CountingDescriber;
-using QX::test::FakeBmc;
-using QX::test::selRecord;
+using namespace QX::test;
 
 namespace
 {
