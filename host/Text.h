@@ -29,7 +29,6 @@ class Text
     Text(std::string_view text); // NOLINT: reads as the text itself
     Text(const std::string& text) : Text(std::string_view(text)) {} // NOLINT
     Text(const char* text) :
-        // NOLINT
         Text(text == nullptr ? std::string_view() : std::string_view(text))
     {
     }
