@@ -1,6 +1,7 @@
 #pragma once
 
 #include "BmcCommands.h"
+#include "CipherSuiteChoice.h"
 #include "FreeIpmiHandles.h"
 
 #include <atomic>
@@ -38,7 +39,10 @@ namespace QX::Ipmi
 class IpmiSession : public BmcCommands
 {
   public:
-    explicit IpmiSession(SessionParameters parameters);
+    /** @p cipherSuites picks the suite of each LAN session; by default
+     *  the one in @p parameters. */
+    explicit IpmiSession(SessionParameters parameters,
+                         CipherSuiteChoice cipherSuites = {});
 
     IpmiSession(const IpmiSession&) = delete;
     IpmiSession& operator=(const IpmiSession&) = delete;
@@ -62,6 +66,12 @@ class IpmiSession : public BmcCommands
      */
     void run(const std::function<void(IpmiContext&)>& work);
 
+    /** How LAN sessions pick their cipher suite, and how they did. */
+    const CipherSuiteChoice& cipherSuites() const
+    {
+        return cipherSuites_;
+    }
+
     /** "LAN 2.0 host:port" or "in-band (KCS)", for log lines. */
     std::string peerName() const;
     /** A name for files kept per BMC: "lan-host_port" or "inband". */
@@ -71,6 +81,8 @@ class IpmiSession : public BmcCommands
     struct PendingCall;
 
     std::shared_ptr<IpmiContext> open();
+    /** A new LAN session, trying the cipher suites in turn. */
+    std::shared_ptr<IpmiContext> openLan();
     template <typename Result, typename Work>
     Result exchange(Work work);
     template <typename Result, typename Work>
@@ -80,6 +92,7 @@ class IpmiSession : public BmcCommands
     void noteFailure(const IpmiError& error);
 
     SessionParameters parameters_;
+    CipherSuiteChoice cipherSuites_;
     std::chrono::milliseconds reopenAfter_;
     bool guarded_;
     std::shared_ptr<IpmiContext> context_;
