@@ -111,11 +111,23 @@ class SelBehaviourTest : public bmctest::AlertTest
 };
 
 // Behaviours 1 and 3: a full ring of 16 whose Get SEL Info never changes.
-TEST_F(SelBehaviourTest, FrozenRingEnumerationIsTheTrueSel)
+TEST_F(SelBehaviourTest, FrozenRingEnumerationIsTheTrueSelAsIpmitoolWalksIt)
 {
     launchWith(bmcsim::SelBehaviour::frozenRing(), 16, 16);
     ASSERT_EQ(bmc().moduleSel().size(), 16u);
     expectEnumerationIsTheTrueSel();
+
+    // ipmitool's walk of the wrapped ring (ids 6..16, then 1..5) is the
+    // module's SEL too.
+    bmc().addRecords(fanRecords(5));
+    const auto truth = bmc().moduleSel();
+    const auto walked = ipmitoolRecords();
+    ASSERT_EQ(walked.size(), truth.size());
+    for (std::size_t i = 0; i < truth.size(); ++i)
+    {
+        EXPECT_EQ(walked[i].id, idOf(truth[i])) << i;
+        EXPECT_EQ(walked[i].bytes, hexBytes(truth[i])) << i;
+    }
 }
 
 TEST_F(SelBehaviourTest, FrozenRingShowsRecordsThatReplacedTheOldest)

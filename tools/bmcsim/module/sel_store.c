@@ -4,6 +4,7 @@
  */
 #include "sel_store.h"
 
+#include <errno.h>
 #include <stdio.h>
 #include <stdlib.h>
 #include <string.h>
@@ -63,6 +64,43 @@ void selb_save(void)
     }
 }
 
+/* Parses a whole unsigned number in @p base; 0 when it is not one. */
+static int parse_number(const char* text, int base, unsigned long limit,
+                        unsigned long* value)
+{
+    char* end = NULL;
+    errno = 0;
+    *value = strtoul(text, &end, base);
+    return errno == 0 && end != text && *end == '\0' && *value <= limit &&
+           text[0] != '-';
+}
+
+/* "name value": the value when @p line is that setting. */
+static int setting(char* line, const char* name, unsigned long* value)
+{
+    const size_t length = strlen(name);
+    return strncmp(line, name, length) == 0 && line[length] == ' ' &&
+           parse_number(line + length + 1, 10, 0xffffffffUL, value);
+}
+
+/* A record line: 16 hex pairs separated by blanks. */
+static int record_line(char* line, unsigned char* record)
+{
+    char* rest = line;
+    char* word;
+    unsigned filled = 0;
+    while ((word = strtok_r(rest, " ", &rest)) != NULL)
+    {
+        unsigned long byte = 0;
+        if (filled == RECORD_SIZE || !parse_number(word, 16, 0xff, &byte))
+        {
+            return 0;
+        }
+        record[filled++] = (unsigned char)byte;
+    }
+    return filled == RECORD_SIZE;
+}
+
 void selb_load(void)
 {
     char line[256];
@@ -74,36 +112,27 @@ void selb_load(void)
     }
     while (fgets(line, sizeof line, in))
     {
-        unsigned value = 0;
-        unsigned bytes[RECORD_SIZE];
-        unsigned i;
-        if (sscanf(line, "next-id %u", &value) == 1)
+        unsigned long value = 0;
+        unsigned char* record = selb_state.records[selb_state.count];
+        line[strcspn(line, "\r\n")] = '\0';
+        if (setting(line, "next-id", &value))
         {
-            selb_state.next_id = value;
+            selb_state.next_id = (unsigned)value;
         }
-        else if (sscanf(line, "last-add %u", &value) == 1)
+        else if (setting(line, "last-add", &value))
         {
-            selb_state.last_add = value;
+            selb_state.last_add = (uint32_t)value;
         }
-        else if (sscanf(line, "last-erase %u", &value) == 1)
+        else if (setting(line, "last-erase", &value))
         {
-            selb_state.last_erase = value;
+            selb_state.last_erase = (uint32_t)value;
         }
         else if (selb_state.count < selb_state.capacity &&
-                 sscanf(line, "%x %x %x %x %x %x %x %x %x %x %x %x %x %x %x %x",
-                        &bytes[0], &bytes[1], &bytes[2], &bytes[3], &bytes[4],
-                        &bytes[5], &bytes[6], &bytes[7], &bytes[8], &bytes[9],
-                        &bytes[10], &bytes[11], &bytes[12], &bytes[13],
-                        &bytes[14], &bytes[15]) == RECORD_SIZE)
+                 record_line(line, record))
         {
-            for (i = 0; i < RECORD_SIZE; ++i)
+            if (selb_record_id(record) > highest)
             {
-                selb_state.records[selb_state.count][i] =
-                    (unsigned char)bytes[i];
-            }
-            if (selb_record_id(selb_state.records[selb_state.count]) > highest)
-            {
-                highest = selb_record_id(selb_state.records[selb_state.count]);
+                highest = selb_record_id(record);
             }
             ++selb_state.count;
         }
@@ -208,6 +237,55 @@ void selb_settle(void)
     }
 }
 
+/* Applies one key=value option; 0 when it is not one of ours. */
+static int apply_option(const char* key, const char* value)
+{
+    unsigned long number = 0;
+    if (strcmp(key, "state") == 0)
+    {
+        snprintf(selb_state.path, sizeof selb_state.path, "%s", value);
+        return 1;
+    }
+    if (strcmp(key, "reserve") == 0)
+    {
+        if (!parse_number(value, 16, 0xff, &number))
+        {
+            return 0;
+        }
+        selb_state.reserve_cc = (unsigned)number;
+        return 1;
+    }
+    if (!parse_number(value, 10, 3600000UL, &number))
+    {
+        return 0;
+    }
+    if (strcmp(key, "max") == 0)
+    {
+        selb_state.capacity = (unsigned)number;
+    }
+    else if (strcmp(key, "ring") == 0)
+    {
+        selb_state.ring = number != 0;
+    }
+    else if (strcmp(key, "frozen") == 0)
+    {
+        selb_state.frozen = number != 0;
+    }
+    else if (strcmp(key, "clear-ms") == 0)
+    {
+        selb_state.clear_ms = (unsigned)number;
+    }
+    else if (strcmp(key, "clear-record") == 0)
+    {
+        selb_state.clear_record = number != 0;
+    }
+    else
+    {
+        return 0;
+    }
+    return 1;
+}
+
 void selb_parse_options(const char* options)
 {
     char copy[2048];
@@ -217,42 +295,13 @@ void selb_parse_options(const char* options)
     while ((word = strtok_r(rest, " \t", &rest)) != NULL)
     {
         char* value = strchr(word, '=');
-        if (!value)
+        if (value)
         {
-            continue;
+            *value++ = '\0';
         }
-        *value++ = '\0';
-        if (strcmp(word, "state") == 0)
+        if (!value || !apply_option(word, value))
         {
-            snprintf(selb_state.path, sizeof selb_state.path, "%s", value);
-        }
-        else if (strcmp(word, "max") == 0)
-        {
-            selb_state.capacity = (unsigned)strtoul(value, NULL, 0);
-        }
-        else if (strcmp(word, "ring") == 0)
-        {
-            selb_state.ring = atoi(value) != 0;
-        }
-        else if (strcmp(word, "frozen") == 0)
-        {
-            selb_state.frozen = atoi(value) != 0;
-        }
-        else if (strcmp(word, "clear-ms") == 0)
-        {
-            selb_state.clear_ms = (unsigned)strtoul(value, NULL, 0);
-        }
-        else if (strcmp(word, "clear-record") == 0)
-        {
-            selb_state.clear_record = atoi(value) != 0;
-        }
-        else if (strcmp(word, "reserve") == 0)
-        {
-            selb_state.reserve_cc = (unsigned)strtoul(value, NULL, 16) & 0xff;
-        }
-        else
-        {
-            fprintf(stderr, "sel module: unknown option %s\n", word);
+            fprintf(stderr, "sel module: option %s ignored\n", word);
         }
     }
     if (selb_state.capacity == 0 || selb_state.capacity > MAX_CAPACITY)
