@@ -49,7 +49,9 @@ class PlatformTest : public ::testing::Test
 TEST(Configuration, DefaultsWhenEmpty)
 {
     const auto configuration = Platform::parseConfiguration("", "x");
-    EXPECT_EQ(configuration.source, "memory");
+    // The server's own BMC, never the built-in sample.
+    EXPECT_EQ(configuration.source, "ipmi");
+    EXPECT_EQ(configuration.ipmi.interface, Ipmi::Interface::InBand);
     EXPECT_EQ(configuration.fixtureFile, "");
     EXPECT_EQ(configuration.logSink, "syslog");
     EXPECT_EQ(configuration.logLevel, 6000);
@@ -174,7 +176,7 @@ TEST_F(PlatformTest, CurrentSourceBuildsFromTheConfiguredFixture)
 
 TEST_F(PlatformTest, EmptyFixtureSettingUsesTheBuiltInSample)
 {
-    const TempFile configuration("log.sink = none\n");
+    const TempFile configuration("source = memory\nlog.sink = none\n");
     environment_.set(Platform::configurationPathVariable, configuration.path());
     Platform::overrideSource(nullptr);
     Instrumentation cursor;
@@ -207,8 +209,8 @@ TEST_F(PlatformTest, BrokenConfigurationFailsEveryCursor)
 
 TEST_F(PlatformTest, MissingFixtureFileFailsWithItsName)
 {
-    const TempFile configuration(
-        "log.sink = none\nmemory.fixture = /nonexistent/sel.fixture\n");
+    const TempFile configuration("source = memory\nlog.sink = none\n"
+                                 "memory.fixture = /nonexistent/sel.fixture\n");
     environment_.set(Platform::configurationPathVariable, configuration.path());
     Platform::overrideSource(nullptr);
     ::testing::internal::CaptureStderr();
@@ -246,7 +248,7 @@ TEST_F(PlatformTest, TheConfiguredLocaleChoosesTheLanguage)
 
 TEST_F(PlatformTest, OverrideSourceReplacesAndNullRereads)
 {
-    const TempFile configuration("log.sink = none\n");
+    const TempFile configuration("source = memory\nlog.sink = none\n");
     environment_.set(Platform::configurationPathVariable, configuration.path());
     const auto memory =
         std::make_shared<MemorySource>(test::twoControllerTree());
