@@ -23,8 +23,8 @@ std::string installedConfigurationText()
     return text.str();
 }
 
-// The "# key = value" lines: a commented-out setting starts with a key
-// that has a dot or is one of the plain keys, then " = ".
+// The "# key = value" lines: after "# ", a key (lower-case letters, dots
+// and dashes), then " =" and an optional value.
 std::vector<std::string> commentedSettings(const std::string& text)
 {
     std::vector<std::string> settings;
@@ -37,15 +37,15 @@ std::vector<std::string> commentedSettings(const std::string& text)
             continue;
         }
         const std::string body = line.substr(2);
-        const std::size_t equals = body.find(" = ");
         const std::size_t blank = body.find(' ');
-        if (equals != std::string::npos && blank == equals &&
-            body.substr(0, equals).find_first_not_of(
-                "abcdefghijklmnopqrstuvwxyz.-") == std::string::npos)
+        if (blank == 0 || blank == std::string::npos ||
+            body.substr(0, blank).find_first_not_of(
+                "abcdefghijklmnopqrstuvwxyz.-") != std::string::npos)
         {
-            settings.push_back(body);
+            continue;
         }
-        else if (body.ends_with(" =") && body.find(' ') == body.size() - 2)
+        const std::string rest = body.substr(blank);
+        if (rest == " =" || rest.starts_with(" = "))
         {
             settings.push_back(body);
         }
