@@ -40,6 +40,12 @@ if [[ $actual != "$expected" ]]; then
     exit 1
 fi
 
+# Nothing of the build machine: no file names the source or build tree
+# (trace lines name sources relative to it, RUNPATH is $ORIGIN).
+if leaks=$(grep -rlF "$PWD" "$root"); then
+    echo "package files that name $PWD:"; echo "$leaks"; exit 1
+fi
+
 # Modes and owners as the package records them: the configuration may hold
 # a password, the state directory is the platform's alone.
 listing=$(dpkg-deb -c "$deb")
