@@ -4,6 +4,7 @@
 #include "Instrumentation.h"
 #include "MemorySource.h"
 #include "Resources.h"
+#include "platform/CapturedLog.h"
 #include "platform/ConfigurationFiles.h"
 #include "platform/EnvironmentGuard.h"
 #include "platform/TestTrees.h"
@@ -205,6 +206,32 @@ TEST_F(PlatformTest, BrokenConfigurationFailsEveryCursor)
     }
     const std::string written = ::testing::internal::GetCapturedStderr();
     EXPECT_THAT(written, HasSubstr("source must be one of: memory"));
+}
+
+TEST_F(PlatformTest, UnavailablePlatformIsAFailureInTheLog)
+{
+    const TempFile configuration("source = bmc\n");
+    environment_.set(Platform::configurationPathVariable, configuration.path());
+    Platform::overrideSource(nullptr);
+    CVLog::CVLogger::configure(CVLog::LoggerSettings{});
+    const test::CapturedLog log;
+    ::testing::internal::CaptureStderr();
+    EXPECT_THROW(Platform::currentSource(), std::runtime_error);
+    ::testing::internal::GetCapturedStderr();
+    int failures = 0;
+    for (const auto& record : log.records())
+    {
+        if (record.message.find("instrumentation platform unavailable") !=
+            std::string::npos)
+        {
+            EXPECT_EQ(record.channel, CVLog::Channel::Log);
+            EXPECT_EQ(record.level, 6000);
+            EXPECT_EQ(record.component, "QX.Platform");
+            EXPECT_THAT(record.message, HasSubstr("source must be one of"));
+            ++failures;
+        }
+    }
+    EXPECT_EQ(failures, 1);
 }
 
 TEST_F(PlatformTest, MissingFixtureFileFailsWithItsName)
