@@ -1,7 +1,9 @@
 // The provider as a freshly installed machine runs it: no platform
 // configuration, or one that names no source. The platform then reads the
 // server's own BMC in band; on a machine without one a request gets no
-// data (never the built-in sample) and one line says what is missing.
+// data (never the built-in sample) and one line says what is missing. A
+// platform that cannot be set up at all fails a subscription's watch with
+// a line in the log as well.
 #include "EntryFixture.h"
 
 #include <cstdlib>
@@ -166,6 +168,42 @@ TEST_F(DefaultSource, ConfigurationWithoutSourceLogsWhatIsMissing)
     EXPECT_EQ(occurrences(log.str(), "LOG 6000 [QX.Platform.IPMI]"), 2u)
         << log.str();
     EXPECT_EQ(log.str().find("CPU1 Temp"), std::string::npos);
+}
+
+TEST_F(DefaultSource, AWatchThePlatformCannotStartIsAFailureInTheLog)
+{
+    const auto file = std::filesystem::temp_directory_path() /
+                      ("broken-" + std::to_string(::getpid()) + ".conf");
+    std::ofstream(file) << "source = bmc\n";
+    ::setenv(QX::Platform::configurationPathVariable, file.c_str(), 1);
+    const auto capture = std::make_shared<CVLog::CaptureSink>();
+    const CVLog::LoggerSettings previous = CVLog::CVLogger::settings();
+    CVLog::CVLogger::setSink(capture);
+    CVLog::CVLogger::configure(CVLog::LoggerSettings{});
+    ::testing::internal::CaptureStderr();
+    const auto filter =
+        host::IndicationFilter::forClass("ZAN_MgmtHwLogEntryEvent");
+    const host::Outcome outcome = host().activateFilter(filter, true);
+    const std::string written = ::testing::internal::GetCapturedStderr();
+    CVLog::CVLogger::configure(previous);
+    std::filesystem::remove(file);
+    EXPECT_EQ(outcome.rc, CMPI_RC_OK);
+    EXPECT_NE(written.find("source must be one of"), std::string::npos)
+        << written;
+    unsigned watchFailures = 0;
+    for (const auto& record : capture->records())
+    {
+        if (record.function == "Watches::start")
+        {
+            EXPECT_EQ(record.level, 6000);
+            EXPECT_EQ(record.component, "Corvane.SELProvider");
+            EXPECT_NE(record.message.find("source must be one of"),
+                      std::string::npos)
+                << record.message;
+            watchFailures += record.channel == CVLog::Channel::Log ? 1 : 0;
+        }
+    }
+    EXPECT_EQ(watchFailures, 1u);
 }
 
 TEST_F(DefaultSource, SampleOnlyWhereTheConfigurationAsksForIt)
