@@ -1,6 +1,7 @@
 #include "ExchangeWorker.h"
 
 #include <pthread.h>
+#include <stdexcept>
 
 namespace QX::Ipmi
 {
@@ -24,6 +25,10 @@ bool ExchangeWorker::run(std::function<void()> job,
                          std::chrono::milliseconds timeout)
 {
     std::unique_lock lock(mutex_);
+    if (running_)
+    {
+        throw std::logic_error("ExchangeWorker::run while a job is running");
+    }
     job_ = std::move(job);
     running_ = true;
     const std::uint64_t ticket = completed_ + 1;

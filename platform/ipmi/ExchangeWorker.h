@@ -40,8 +40,8 @@ class ExchangeWorker
      * Runs @p job on the worker. True when it finished within @p timeout;
      * false when it did not (it goes on, and the worker stays busy until
      * it returns). @p job must own everything it touches, since it may
-     * outlive this call, and keep its errors (it must not throw). Must
-     * not be called while busy().
+     * outlive this call, and keep its errors (it must not throw). Throws
+     * std::logic_error while busy().
      */
     bool run(std::function<void()> job, std::chrono::milliseconds timeout);
     /** A job given up on is still running. */

@@ -7,6 +7,7 @@
 #include <chrono>
 #include <future>
 #include <memory>
+#include <stdexcept>
 #include <thread>
 
 #include <gtest/gtest.h>
@@ -49,6 +50,7 @@ TEST(ExchangeWorker, GivesUpAfterTheTimeoutAndStaysBusyUntilTheJobReturns)
     EXPECT_GE(std::chrono::steady_clock::now() - start, 100ms);
     EXPECT_TRUE(worker.busy());
     EXPECT_FALSE(finished->load());
+    EXPECT_THROW(worker.run([] {}, 1s), std::logic_error);
 
     release->set_value();
     const auto deadline = std::chrono::steady_clock::now() + 10s;
