@@ -4,10 +4,14 @@
 #include "Platform.h"
 #include "SystemEventRecord.h"
 #include "ipmi/ExchangeWorker.h"
+#include "ipmi/FreeIpmiHandles.h"
 
+#include <algorithm>
+#include <array>
 #include <cstdlib>
 #include <filesystem>
 #include <fstream>
+#include <stdexcept>
 #include <thread>
 
 namespace inbandtest
@@ -75,6 +79,31 @@ std::uint16_t InbandTest::addRecords(unsigned count)
             }
             return id;
         });
+}
+
+std::uint16_t InbandTest::addThroughDriver(const inbandsim::Record& record)
+{
+    QX::Ipmi::SessionParameters parameters;
+    parameters.driver = IPMI_DEVICE_OPENIPMI;
+    parameters.driverDevice = devicePath;
+    const QX::Ipmi::IpmiContext context(parameters);
+    std::array<std::uint8_t, 17> request{0x44};
+    std::copy(record.begin(), record.end(), request.begin() + 1);
+    std::array<std::uint8_t, 16> response{};
+    const int length = ipmi_cmd_raw(
+        context.get(), IPMI_BMC_IPMB_LUN_BMC, IPMI_NET_FN_STORAGE_RQ,
+        request.data(), static_cast<unsigned>(request.size()), response.data(),
+        static_cast<unsigned>(response.size()));
+    if (length < 0)
+    {
+        context.fail("ipmi_cmd_raw");
+    }
+    // Command, completion code, record id.
+    if (length != 4 || response[1] != 0)
+    {
+        throw std::runtime_error("Add SEL Entry failed");
+    }
+    return static_cast<std::uint16_t>(response[2] | response[3] << 8);
 }
 
 host::Outcome InbandTest::enumerate(const std::string& className)

@@ -45,6 +45,10 @@ class InbandTest : public ::testing::Test
     /** Adds @p count temperature records to the simulated BMC; returns the
      *  last record id. */
     std::uint16_t addRecords(unsigned count);
+    /** Adds @p record with Add SEL Entry through a FreeIPMI context of
+     *  its own on the device, as another agent on the server would;
+     *  returns the record id the BMC gave it. */
+    std::uint16_t addThroughDriver(const inbandsim::Record& record);
 
     host::Outcome enumerate(const std::string& className);
     host::Outcome clearLog();

@@ -107,7 +107,10 @@ TEST_F(InbandTest, AddedRecordGivesOneEntryEvent)
         std::this_thread::sleep_for(std::chrono::milliseconds(10));
     }
 
-    const std::uint16_t id = addRecords(1);
+    const std::uint16_t id = addThroughDriver(temperatureRecord(0x47));
+    EXPECT_EQ(device().withBmc([](inbandsim::RawBmc& bmc)
+                               { return bmc.records().size(); }),
+              3u);
     const auto indication = inbox.next(patience);
     ASSERT_TRUE(indication.has_value()) << "no entry event";
     EXPECT_EQ(indication->instance.path.className, entryEvent);
