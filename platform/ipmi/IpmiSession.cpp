@@ -262,9 +262,9 @@ Result IpmiSession::exchange(Work work)
 
 void IpmiSession::run(const std::function<void(IpmiContext&)>& work)
 {
-    // Not guarded: the work uses its caller's state, which must not be
-    // left to a helper thread. The SDR cache code it runs makes single
-    // driver calls bounded by the driver.
+    // Not on the worker: the work uses its caller's state, which must not
+    // be left to the worker after a timeout. The SDR cache code it runs
+    // makes single driver calls bounded by the driver.
     const std::shared_ptr<IpmiContext> context = open();
     try
     {
