@@ -45,6 +45,9 @@ class IpmiSession : public BmcCommands
 {
   public:
     explicit IpmiSession(SessionParameters parameters);
+    /** Joins the in-band worker (defined here, where the worker is known:
+     *  the worker is not part of the library's interface). */
+    ~IpmiSession() override;
 
     IpmiSession(const IpmiSession&) = delete;
     IpmiSession& operator=(const IpmiSession&) = delete;
