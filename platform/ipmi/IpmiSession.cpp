@@ -75,6 +75,8 @@ IpmiSession::IpmiSession(SessionParameters parameters,
     }
 }
 
+IpmiSession::~IpmiSession() = default;
+
 std::string IpmiSession::peerName() const
 {
     if (parameters_.lan)

@@ -49,6 +49,9 @@ class IpmiSession : public BmcCommands
      *  the one in @p parameters. */
     explicit IpmiSession(SessionParameters parameters,
                          CipherSuiteChoice cipherSuites = {});
+    /** Joins the in-band worker (defined here, where the worker is known:
+     *  the worker is not part of the library's interface). */
+    ~IpmiSession() override;
 
     IpmiSession(const IpmiSession&) = delete;
     IpmiSession& operator=(const IpmiSession&) = delete;
