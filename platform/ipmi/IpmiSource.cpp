@@ -17,18 +17,7 @@ namespace
 
 using namespace NodeLexicon;
 
-// Get SEL Info's free space field is 16 bits: FFFFh means "65535 bytes or
-// more", 4095 more records of 16 bytes at the least.
-constexpr std::uint16_t freeSpaceAtLeast = 0xFFFF;
-constexpr unsigned recordBytes = 16;
-constexpr std::uint32_t noEraseYet = 0xFFFFFFFF;
 constexpr unsigned nodeStatusOk = 1;
-
-// Raw OverwritePolicy values: 1 wraps when full, 2 never overwrites.
-constexpr unsigned overwriteWraps = 1;
-constexpr unsigned overwriteNever = 2;
-
-constexpr auto erasePollInterval = std::chrono::milliseconds(20);
 
 void logFailure(const char* what, const std::exception& error)
 {
@@ -48,6 +37,8 @@ IpmiSource::IpmiSource(std::unique_ptr<BmcCommands> bmc,
     controllerDescription_(std::move(controllerDescription)),
     gate_(std::chrono::milliseconds(settings.timeoutMs),
           [bmc = bmc_.get()] { return bmc->lastActivity(); }),
+    cache_(std::chrono::milliseconds(settings.clearWaitMs),
+           std::chrono::seconds(settings.selVerifySeconds)),
     alertStateFile_(std::move(alertStateFile))
 {
     // The password is not needed beyond the session.
@@ -110,7 +101,8 @@ std::shared_ptr<const NodeTree> IpmiSource::refreshTree()
         }
         builderChanged_ = true;
     }
-    const LogState state = logState();
+    const LogState state = logStateOf(cache_.info(), cache_.records(),
+                                      cache_.clearSeen(), settings_);
     if (!logState_ || state != *logState_)
     {
         applyLogState(state);
@@ -153,59 +145,6 @@ void IpmiSource::addEntry(const CachedRecord& record)
     builder_.setProperty(path, RecordData, hexText(record.bytes));
     builder_.setProperty(path, Timestamp,
                          timestampText(record.bytes, settings_.selClock));
-}
-
-IpmiSource::LogState IpmiSource::logState() const
-{
-    const SelInfo& info = cache_.info();
-    const auto& records = cache_.records();
-    const auto count = static_cast<unsigned>(records.size());
-
-    LogState state;
-    bool noRoomLeft = info.overflow;
-    if (settings_.selCapacity != 0)
-    {
-        state.maxRecords = settings_.selCapacity;
-    }
-    else if (info.freeSpace == freeSpaceAtLeast)
-    {
-        state.maxRecords = count + freeSpaceAtLeast / recordBytes;
-    }
-    else
-    {
-        state.maxRecords = count + info.freeSpace / recordBytes;
-        noRoomLeft = noRoomLeft || info.freeSpace < recordBytes;
-    }
-    state.maxRecords = std::max(state.maxRecords, count);
-    state.overwritePolicy =
-        settings_.selWraps ? overwriteWraps : overwriteNever;
-    // BMCs log "Log Area Reset/Cleared" right after a clear: a log that
-    // holds only that record has been emptied.
-    state.isEmpty =
-        records.empty() ||
-        (records.size() == 1 && isLogClearedRecord(records.front().bytes));
-    const bool erased =
-        info.mostRecentErase != 0 && info.mostRecentErase != noEraseYet;
-
-    if (noRoomLeft || count >= state.maxRecords)
-    {
-        state.status = EventLogStatusFull;
-    }
-    else if (static_cast<std::uint64_t>(count) * 100 >=
-             static_cast<std::uint64_t>(settings_.warningFillPercent) *
-                 state.maxRecords)
-    {
-        state.status = EventLogStatusAlmostFull;
-    }
-    else if (state.isEmpty && erased)
-    {
-        state.status = EventLogStatusCleared;
-    }
-    else
-    {
-        state.status = nodeStatusOk;
-    }
-    return state;
 }
 
 void IpmiSource::applyLogState(const LogState& state)
@@ -290,42 +229,7 @@ bool IpmiSource::writeProperty(const std::string& path,
 
 void IpmiSource::clearSel()
 {
-    // The copy no longer matches the SEL, whatever happens below.
-    cache_.invalidate();
-    const SelInfo info = bmc_->getSelInfo();
-    for (unsigned attempt = 1;; ++attempt)
-    {
-        const std::uint16_t reservation =
-            info.reserveSupported ? bmc_->reserveSel() : 0;
-        try
-        {
-            bmc_->initiateSelErase(reservation);
-            const auto deadline =
-                std::chrono::steady_clock::now() +
-                std::chrono::milliseconds(settings_.timeoutMs);
-            while (!bmc_->selEraseCompleted(reservation))
-            {
-                if (std::chrono::steady_clock::now() >= deadline)
-                {
-                    throw IpmiError("Clear SEL", ErrorCategory::Timeout,
-                                    "the BMC did not finish erasing within " +
-                                        std::to_string(settings_.timeoutMs) +
-                                        " ms");
-                }
-                std::this_thread::sleep_for(erasePollInterval);
-            }
-            return;
-        }
-        catch (const IpmiError& error)
-        {
-            // Another client reserved the SEL in between: reserve again.
-            if (error.completionCode() != completionReservationCancelled ||
-                attempt >= SelCache::walkAttempts)
-            {
-                throw;
-            }
-        }
-    }
+    cache_.erase(*bmc_);
 }
 
 std::string IpmiSource::printablePath(const std::string& path) const
@@ -395,6 +299,7 @@ void IpmiSource::pollOnce()
             refreshTree();
             SelObservation now;
             now.records = &cache_.records();
+            now.version = cache_.version();
             now.info = cache_.info();
             now.logStatus = logState_ ? logState_->status : nodeStatusOk;
             now.restartCause = restartCause_;

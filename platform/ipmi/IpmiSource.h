@@ -9,6 +9,7 @@
 #include "RecordDescriber.h"
 #include "SelAlertTracker.h"
 #include "SelCache.h"
+#include "SelFill.h"
 
 #include <atomic>
 #include <condition_variable>
@@ -106,18 +107,9 @@ class IpmiSource : public InstrumentationSource
     static std::string entryPath(std::uint32_t run, std::uint16_t recordId);
 
   private:
-    struct LogState
-    {
-        unsigned maxRecords = 0;
-        unsigned overwritePolicy = 0;
-        bool isEmpty = true;
-        unsigned status = 0;
-        bool operator==(const LogState&) const = default;
-    };
     std::shared_ptr<const NodeTree> refreshTree();
     void rebuildEntries();
     void addEntry(const CachedRecord& record);
-    LogState logState() const;
     void applyLogState(const LogState& state);
     void refreshRestartCause(bool selChanged);
     void applyRestartCause();

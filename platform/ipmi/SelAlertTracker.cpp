@@ -22,6 +22,8 @@ constexpr std::uint8_t firstRestartOffset = 1;
 constexpr std::uint8_t lastRestartOffset = 3;
 // Restart key when the BMC reports a watchdog restart without a record.
 constexpr const char* restartWithoutRecord = "cause-only";
+// A last-erase time of FFFFFFFFh means "never erased" (or "not kept").
+constexpr std::uint32_t noEraseTime = 0xFFFFFFFF;
 
 PendingAlert alert(NodeType kind, unsigned code, std::string path)
 {
@@ -141,18 +143,38 @@ TrackerResult SelAlertTracker::start(const std::optional<AnnouncedState>& kept,
     return result;
 }
 
+bool SelAlertTracker::clearedSince(const SelObservation& now) const
+{
+    if (now.info.mostRecentErase != lastInfo_.mostRecentErase &&
+        now.info.mostRecentErase != noEraseTime)
+    {
+        return true;
+    }
+    if (known_.empty())
+    {
+        return false;
+    }
+    const std::vector<CachedRecord>& records = *now.records;
+    const bool allGone =
+        std::none_of(records.begin(), records.end(),
+                     [this](const CachedRecord& record)
+                     { return known_.count(record.bytes) != 0; });
+    return allGone &&
+           (records.empty() || isLogClearedRecord(records.front().bytes));
+}
+
 TrackerResult SelAlertTracker::observe(const SelObservation& now)
 {
     TrackerResult result;
-    if (now.info.sameRecordsAs(lastInfo_) &&
-        now.logStatus == state_.logStatus &&
-        now.records->size() == known_.size())
+    if (now.version == lastVersion_ &&
+        now.info.mostRecentErase == lastInfo_.mostRecentErase &&
+        now.logStatus == state_.logStatus)
     {
         lastInfo_ = now.info;
         return result;
     }
     const AnnouncedState before = state_;
-    if (now.info.mostRecentErase != lastInfo_.mostRecentErase)
+    if (clearedSince(now))
     {
         result.alerts.push_back(
             alert(EventLog, AlertOnEventLog, IpmiSource::logPath));
@@ -174,10 +196,14 @@ TrackerResult SelAlertTracker::observe(const SelObservation& now)
 void SelAlertTracker::announceNew(const SelObservation& now,
                                   std::vector<PendingAlert>& out)
 {
+    // Each record seen before accounts for one of equal bytes now.
+    std::multiset<SelRecordBytes> unmatched = known_;
     for (const CachedRecord& record : *now.records)
     {
-        if (known_.count(record.bytes) != 0)
+        const auto seen = unmatched.find(record.bytes);
+        if (seen != unmatched.end())
         {
+            unmatched.erase(seen);
             continue;
         }
         out.push_back(alert(EventLogEntry, AlertOnEventLogEntry,
@@ -210,6 +236,7 @@ void SelAlertTracker::remember(const SelObservation& now)
     state_.lastAddition = now.info.mostRecentAddition;
     state_.lastErase = now.info.mostRecentErase;
     lastInfo_ = now.info;
+    lastVersion_ = now.version;
 }
 
 } // namespace QX::Ipmi

@@ -16,6 +16,8 @@ namespace QX::Ipmi
 struct SelObservation
 {
     const std::vector<CachedRecord>* records = nullptr;
+    /** Changes whenever the records do (SelCache::version). */
+    std::uint64_t version = 0;
     SelInfo info;
     unsigned logStatus = 0;
     std::optional<std::uint8_t> restartCause;
@@ -40,7 +42,14 @@ struct TrackerResult
  * everything present counts as already announced) and announces what
  * happened meanwhile; observe() compares each later view with the one
  * before. Records are compared by their 16 bytes, which hold id and
- * timestamp, because record ids start again after some BMC restarts.
+ * timestamp, because record ids start again after some BMC restarts and
+ * ring buffers reuse them; how often equal bytes occur counts too.
+ *
+ * A clear is announced when the last-erase time moves to a real time, or,
+ * for BMCs whose Get SEL Info times never move, when every record seen
+ * before is gone and the SEL is empty or its first new record is the
+ * "log cleared" one. Records that were overwritten (a ring buffer) or ids
+ * that started again give no clear.
  * Not thread-safe.
  */
 class SelAlertTracker
@@ -70,12 +79,14 @@ class SelAlertTracker
   private:
     void announceNew(const SelObservation& now, std::vector<PendingAlert>& out);
     void remember(const SelObservation& now);
+    bool clearedSince(const SelObservation& now) const;
     static std::string restartKeyOf(const std::vector<CachedRecord>& records);
 
     bool started_ = false;
     AnnouncedState state_;
     SelInfo lastInfo_;
-    std::set<SelRecordBytes> known_;
+    std::uint64_t lastVersion_ = 0;
+    std::multiset<SelRecordBytes> known_;
 };
 
 } // namespace QX::Ipmi

@@ -21,6 +21,8 @@ constexpr std::size_t eventData1Byte = 13;
 constexpr std::uint8_t sensorTypeEventLoggingDisabled = 0x10;
 constexpr std::uint8_t eventTypeSensorSpecific = 0x6F;
 constexpr std::uint8_t offsetLogAreaResetCleared = 0x02;
+constexpr std::uint8_t offsetSelFull = 0x04;
+constexpr std::uint8_t offsetSelAlmostFull = 0x05;
 
 std::uint32_t rawTimestamp(const SelRecordBytes& record)
 {
@@ -121,6 +123,25 @@ bool isLogClearedRecord(const SelRecordBytes& record)
            record[sensorTypeByte] == sensorTypeEventLoggingDisabled &&
            record[eventTypeByte] == eventTypeSensorSpecific &&
            (record[eventData1Byte] & 0x0F) == offsetLogAreaResetCleared;
+}
+
+FillEvent fillEventOf(const SelRecordBytes& record)
+{
+    if (recordTypeOf(record) != systemEventRecord ||
+        record[sensorTypeByte] != sensorTypeEventLoggingDisabled ||
+        record[eventTypeByte] != eventTypeSensorSpecific)
+    {
+        return FillEvent::None;
+    }
+    switch (record[eventData1Byte] & 0x0F)
+    {
+        case offsetSelFull:
+            return FillEvent::Full;
+        case offsetSelAlmostFull:
+            return FillEvent::AlmostFull;
+        default:
+            return FillEvent::None;
+    }
 }
 
 std::string fallbackDescription(const SelRecordBytes& record)

@@ -114,14 +114,19 @@ class FakeBmc : public Ipmi::BmcCommands
                                 ? std::nullopt
                                 : std::optional<unsigned>(*cancelAtEntry - 1);
         }
-        if (cancelNow || reservationId != reservation_)
+        // Reservation 0 reads whole records without one.
+        if (cancelNow || (reservationId != 0 && reservationId != reservation_))
         {
             throw Ipmi::IpmiError(
                 "ipmi_cmd_get_sel_entry", Ipmi::ErrorCategory::CompletionCode,
                 "reservation cancelled", Ipmi::completionReservationCancelled);
         }
         auto found = sel.begin();
-        if (recordId != Ipmi::firstRecordId)
+        if (recordId == Ipmi::lastRecordId)
+        {
+            found = sel.empty() ? sel.end() : sel.end() - 1;
+        }
+        else if (recordId != Ipmi::firstRecordId)
         {
             found = std::find_if(sel.begin(), sel.end(),
                                  [recordId](const Ipmi::SelRecordBytes& r)

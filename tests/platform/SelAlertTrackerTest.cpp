@@ -38,6 +38,7 @@ class SelAlertTrackerTest : public ::testing::Test
         record.bytes = bytes;
         records.push_back(record);
         ++addition;
+        ++version;
     }
     void addRecords(unsigned count)
     {
@@ -51,11 +52,13 @@ class SelAlertTrackerTest : public ::testing::Test
     {
         records.clear();
         ++erase;
+        ++version;
     }
     SelObservation now() const
     {
         SelObservation observation;
         observation.records = &records;
+        observation.version = version;
         observation.info.entries = static_cast<std::uint16_t>(records.size());
         observation.info.mostRecentAddition = addition;
         observation.info.mostRecentErase = erase;
@@ -84,6 +87,7 @@ class SelAlertTrackerTest : public ::testing::Test
     unsigned status = 1;
     std::optional<std::uint8_t> cause = 0;
     std::uint16_t nextId = 1;
+    std::uint64_t version = 0;
     SelAlertTracker tracker;
 };
 
