@@ -8,6 +8,7 @@
 using namespace QX;
 using namespace QX::Ipmi;
 using namespace QX::NodeLexicon;
+using QX::test::logClearedRecord;
 using QX::test::selRecord;
 
 namespace
@@ -314,6 +315,53 @@ TEST_F(SelAlertTrackerTest, RestartCauseWithoutRecordIsAnnouncedOnce)
     cause = 1; // another cause: nothing
     SelAlertTracker third;
     EXPECT_TRUE(third.start(kept, now()).alerts.empty());
+}
+
+TEST_F(SelAlertTrackerTest, FrozenEraseTimeClearIsSeenInTheRecords)
+{
+    addRecords(4);
+    tracker.start(std::nullopt, now());
+    // The SEL emptied, the last-erase time the same: a clear all the same.
+    records.clear();
+    ++version;
+    add(logClearedRecord(1));
+    const TrackerResult result = tracker.observe(now());
+    EXPECT_EQ(paths(result, EventLog), std::vector<std::string>{"/bmc0/sel"});
+    EXPECT_EQ(paths(result, EventLogEntry),
+              std::vector<std::string>{"/bmc0/sel/entry-00001"});
+    EXPECT_TRUE(tracker.observe(now()).alerts.empty());
+}
+
+TEST_F(SelAlertTrackerTest, UnsetEraseTimeIsNoClear)
+{
+    erase = 0xFFFFFFFF;
+    addRecords(2);
+    tracker.start(std::nullopt, now());
+    addRecords(1);
+    const TrackerResult result = tracker.observe(now());
+    EXPECT_TRUE(paths(result, EventLog).empty());
+    EXPECT_EQ(paths(result, EventLogEntry).size(), 1u);
+}
+
+TEST_F(SelAlertTrackerTest, EveryRecordReplacedWithoutAnEraseIsNoClear)
+{
+    addRecords(3);
+    tracker.start(std::nullopt, now());
+    // A ring buffer overwrote all three: new records, no clear.
+    records.clear();
+    addRecords(3);
+    const TrackerResult result = tracker.observe(now());
+    EXPECT_TRUE(paths(result, EventLog).empty());
+    EXPECT_EQ(paths(result, EventLogEntry).size(), 3u);
+}
+
+TEST_F(SelAlertTrackerTest, EqualBytesTwiceAreTwoRecords)
+{
+    add(selRecord(7, 0x65e58300));
+    tracker.start(std::nullopt, now());
+    add(selRecord(7, 0x65e58300));
+    const TrackerResult result = tracker.observe(now());
+    EXPECT_EQ(paths(result, EventLogEntry).size(), 1u);
 }
 
 } // namespace

@@ -5,6 +5,8 @@
 
 #include "ProfileFixture.h"
 
+#include <iostream>
+
 #include <gmock/gmock.h>
 
 using namespace profiles;
@@ -153,6 +155,7 @@ TEST_F(AlertingProfilesTest, IdRestartWithoutEraseIsNoClear)
 {
     BmcProfile profile;
     profile.frozenTimestamps = true;
+    profile.firstId = 5001;
     start(profile);
     addRecords(4);
     subscribeAll();
@@ -278,7 +281,9 @@ TEST_F(AlertingProfilesTest, ColdReadCostsOneRequestPerRecord)
     expectEnumerationIsTheSel();
     const std::uint64_t spent = ipmi().requestCount() - before;
     // Each record once, plus Get SEL Info twice, Reserve SEL and the
-    // restart cause.
-    EXPECT_LE(spent, 300u + 4u);
+    // restart cause, and two requests for each further look the request
+    // takes at the SEL.
+    EXPECT_LE(spent, 300u + 12u);
     EXPECT_GE(spent, 300u);
+    std::cout << "cold read of 300 records: " << spent << " requests\n";
 }

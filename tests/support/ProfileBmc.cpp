@@ -50,7 +50,10 @@ Ipmi::SelRecordBytes loggingDisabledBody(std::uint8_t offset)
                                      {0x10, 0x01, 0x6f, offset, 0xff, 0xff});
 }
 
-ProfileBmc::ProfileBmc(BmcProfile profile) : profile_(profile) {}
+ProfileBmc::ProfileBmc(BmcProfile profile) :
+    profile_(profile), nextId_(profile.firstId)
+{
+}
 
 ProfileBmc::Lock ProfileBmc::exchange()
 {

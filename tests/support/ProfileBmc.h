@@ -49,8 +49,9 @@ struct BmcProfile
     FreeSpaceAnswer freeSpace = FreeSpaceAnswer::True;
     /** The overflow flag is never set. */
     bool overflowNeverSet = false;
-    /** Step between two record ids, and the id after which they start
-     *  again at 1. */
+    /** The first record id, the step between two ids, and the id after
+     *  which they start again at 1. */
+    std::uint16_t firstId = 1;
     std::uint16_t idStep = 1;
     std::uint16_t lastId = 0xFFFE;
     /** A deleted record's id is given to the next record. */
