@@ -2,6 +2,7 @@
 
 #include "IpmiSource.h"
 #include "NodeLexicon.h"
+#include "SelRecord.h"
 #include "SelRecordText.h"
 
 #include <algorithm>
@@ -14,7 +15,6 @@ namespace
 
 using namespace NodeLexicon;
 
-constexpr std::uint8_t systemEventRecord = 0x02;
 constexpr std::uint8_t sensorTypeWatchdog2 = 0x23;
 constexpr std::uint8_t sensorSpecificReading = 0x6f;
 // Watchdog 2 offsets: 1 hard reset, 2 power down, 3 power cycle.
@@ -39,12 +39,11 @@ bool isFillStatus(unsigned status)
 
 bool SelAlertTracker::isWatchdogRestart(const SelRecordBytes& record)
 {
-    const bool asserted = (record[12] & 0x80) == 0;
-    const std::uint8_t offset = record[13] & 0x0F;
-    return record[2] == systemEventRecord &&
-           record[10] == sensorTypeWatchdog2 &&
-           (record[12] & 0x7F) == sensorSpecificReading && asserted &&
-           offset >= firstRestartOffset && offset <= lastRestartOffset;
+    const SelRecord fields = SelRecord::parse(record);
+    return fields.isSystemEvent() && fields.sensorType == sensorTypeWatchdog2 &&
+           fields.eventType() == sensorSpecificReading && fields.asserted() &&
+           fields.offset() >= firstRestartOffset &&
+           fields.offset() <= lastRestartOffset;
 }
 
 std::string

@@ -1,6 +1,6 @@
 #include "ProfileBmc.h"
 
-#include "SystemEventRecord.h"
+#include "ipmi/SelRecord.h"
 
 #include <algorithm>
 #include <thread>
@@ -12,7 +12,6 @@ namespace
 {
 
 constexpr std::uint32_t eraseTimeUnset = 0xFFFFFFFF;
-constexpr std::uint8_t systemEventType = 0x02;
 
 Ipmi::IpmiError completion(const char* call, std::uint8_t code,
                            const char* what)
@@ -23,31 +22,47 @@ Ipmi::IpmiError completion(const char* call, std::uint8_t code,
 
 std::uint16_t idOf(const Ipmi::SelRecordBytes& record)
 {
-    return static_cast<std::uint16_t>(record[0] | record[1] << 8);
+    return Ipmi::SelRecord::parse(record).recordId;
 }
 
 std::uint32_t timeOf(const Ipmi::SelRecordBytes& record)
 {
-    return static_cast<std::uint32_t>(record[3]) |
-           static_cast<std::uint32_t>(record[4]) << 8 |
-           static_cast<std::uint32_t>(record[5]) << 16 |
-           static_cast<std::uint32_t>(record[6]) << 24;
+    return Ipmi::SelRecord::parse(record).timestamp;
+}
+
+// @p body with the id and time the BMC gives it.
+Ipmi::SelRecordBytes stamped(const Ipmi::SelRecordBytes& body, std::uint16_t id,
+                             std::uint32_t time)
+{
+    Ipmi::SelRecord record = Ipmi::SelRecord::parse(body);
+    record.recordId = id;
+    record.timestamp = time;
+    if (record.recordType == 0)
+    {
+        record.recordType = Ipmi::SelRecord::systemEventType;
+    }
+    return record.bytes();
 }
 
 } // namespace
 
 Ipmi::SelRecordBytes eventBody(unsigned n)
 {
-    return bmcsim::systemEventRecord(
-        0, 0,
-        {0x01, static_cast<std::uint8_t>(0x30 + (n >> 8 & 0x0F)), 0x01, 0x57,
-         static_cast<std::uint8_t>(n), static_cast<std::uint8_t>(n >> 4)});
+    // Temperature, upper non-critical going high, reading and threshold
+    // varying with n.
+    return Ipmi::SelRecord::systemEvent(
+               0, 0, 0x01, static_cast<std::uint8_t>(0x30 + (n >> 8 & 0x0F)),
+               0x01,
+               {0x57, static_cast<std::uint8_t>(n),
+                static_cast<std::uint8_t>(n >> 4)})
+        .bytes();
 }
 
 Ipmi::SelRecordBytes loggingDisabledBody(std::uint8_t offset)
 {
-    return bmcsim::systemEventRecord(0, 0,
-                                     {0x10, 0x01, 0x6f, offset, 0xff, 0xff});
+    return Ipmi::SelRecord::systemEvent(0, 0, 0x10, 0x01, 0x6f,
+                                        {offset, 0xff, 0xff})
+        .bytes();
 }
 
 ProfileBmc::ProfileBmc(BmcProfile profile) :
@@ -114,16 +129,8 @@ void ProfileBmc::finishErase()
     if (profile_.clearedRecordAfterErase)
     {
         nextId_ = 1;
-        Ipmi::SelRecordBytes record = loggingDisabledBody(0x02);
-        const std::uint32_t time = ++clock_;
-        record[3] = static_cast<std::uint8_t>(time);
-        record[4] = static_cast<std::uint8_t>(time >> 8);
-        record[5] = static_cast<std::uint8_t>(time >> 16);
-        record[6] = static_cast<std::uint8_t>(time >> 24);
         const std::uint16_t id = takeId();
-        record[0] = static_cast<std::uint8_t>(id);
-        record[1] = static_cast<std::uint8_t>(id >> 8);
-        store(record);
+        store(stamped(loggingDisabledBody(0x02), id, ++clock_));
     }
 }
 
@@ -159,17 +166,9 @@ void ProfileBmc::store(Ipmi::SelRecordBytes record)
         sel_.size() >= profile_.capacity)
     {
         wrapped_ = true;
-        Ipmi::SelRecordBytes full = loggingDisabledBody(0x04);
         const std::uint16_t id = takeId();
-        full[0] = static_cast<std::uint8_t>(id);
-        full[1] = static_cast<std::uint8_t>(id >> 8);
-        const std::uint32_t time = clock_;
-        full[3] = static_cast<std::uint8_t>(time);
-        full[4] = static_cast<std::uint8_t>(time >> 8);
-        full[5] = static_cast<std::uint8_t>(time >> 16);
-        full[6] = static_cast<std::uint8_t>(time >> 24);
         sel_.erase(sel_.begin());
-        sel_.push_back(full);
+        sel_.push_back(stamped(loggingDisabledBody(0x04), id, clock_));
     }
 }
 
@@ -178,17 +177,8 @@ std::uint16_t ProfileBmc::add(const Ipmi::SelRecordBytes& body,
 {
     const Lock lock(mutex_);
     settle();
-    Ipmi::SelRecordBytes record = body;
     const std::uint16_t id = takeId();
-    const std::uint32_t when = time ? *time : ++clock_;
-    record[0] = static_cast<std::uint8_t>(id);
-    record[1] = static_cast<std::uint8_t>(id >> 8);
-    record[2] = body[2] == 0 ? systemEventType : body[2];
-    record[3] = static_cast<std::uint8_t>(when);
-    record[4] = static_cast<std::uint8_t>(when >> 8);
-    record[5] = static_cast<std::uint8_t>(when >> 16);
-    record[6] = static_cast<std::uint8_t>(when >> 24);
-    store(record);
+    store(stamped(body, id, time ? *time : ++clock_));
     return id;
 }
 
