@@ -1,6 +1,5 @@
 #include "IpmiSource.h"
 
-#include "AlertState.h"
 #include "IpmiError.h"
 #include "IpmiLog.h"
 #include "SelRecordText.h"
@@ -39,7 +38,10 @@ IpmiSource::IpmiSource(std::unique_ptr<BmcCommands> bmc,
           [bmc = bmc_.get()] { return bmc->lastActivity(); }),
     cache_(std::chrono::milliseconds(settings.clearWaitMs),
            std::chrono::seconds(settings.selVerifySeconds)),
-    alertStateFile_(std::move(alertStateFile))
+    monitor_([this](const std::function<void(const SelObservation&)>& use)
+             { look(use); },
+             alertOf, std::chrono::milliseconds(settings.pollIntervalMs),
+             std::move(alertStateFile))
 {
     // The password is not needed beyond the session.
     settings_.password.clear();
@@ -50,7 +52,7 @@ IpmiSource::IpmiSource(std::unique_ptr<BmcCommands> bmc,
 // session.
 IpmiSource::~IpmiSource()
 {
-    stopPoller(true);
+    monitor_.stop();
     describer_.reset();
 }
 
@@ -240,143 +242,58 @@ std::string IpmiSource::printablePath(const std::string& path) const
 void IpmiSource::startMonitoring(NodeLexicon::NodeType kind,
                                  MonitorCallback callback, const void* context)
 {
-    dispatcher_.add(kind, callback, context);
-    const std::lock_guard lock(pollerMutex_);
-    if (!poller_.joinable() && dispatcher_.total() > 0)
-    {
-        poller_ = std::jthread([this](const std::stop_token& stop)
-                               { pollLoop(stop); });
-    }
+    monitor_.add(kind, callback, context);
 }
 
 void IpmiSource::stopMonitoring(NodeLexicon::NodeType kind,
                                 MonitorCallback callback, const void* context)
 {
-    // Not under the poller lock: this waits for a running callback, which
-    // may itself start or stop monitoring.
-    dispatcher_.remove(kind, callback, context);
-    if (dispatcher_.total() == 0)
-    {
-        stopPoller(false);
-    }
+    monitor_.remove(kind, callback, context);
 }
 
-void IpmiSource::stopPoller(bool evenIfMonitored)
+void IpmiSource::look(const std::function<void(const SelObservation&)>& use)
 {
-    const std::lock_guard lock(pollerMutex_);
-    if (!poller_.joinable() || (!evenIfMonitored && dispatcher_.total() > 0))
-    {
-        return;
-    }
-    poller_.request_stop();
-    if (poller_.get_id() == std::this_thread::get_id())
-    {
-        poller_.detach(); // cannot happen: callbacks run elsewhere
-        return;
-    }
-    // A poll in progress ends within the BMC timeout.
-    poller_.join();
+    const BmcGate::Access access(gate_);
+    refreshTree();
+    SelObservation now;
+    now.records = &cache_.records();
+    now.version = cache_.version();
+    now.info = cache_.info();
+    now.logStatus = logState_ ? logState_->status : nodeStatusOk;
+    now.restartCause = restartCause_;
+    use(now);
 }
 
-void IpmiSource::pollLoop(const std::stop_token& stop)
+PendingAlert IpmiSource::alertOf(const SelEvent& event)
 {
-    const auto interval = std::chrono::milliseconds(settings_.pollIntervalMs);
-    while (!stop.stop_requested())
+    switch (event.kind)
     {
-        pollOnce();
-        std::unique_lock lock(waitMutex_);
-        wake_.wait_for(lock, stop, interval, [] { return false; });
+        case SelEvent::Kind::RecordAdded:
+            return PendingAlert{EventLogEntry, AlertOnEventLogEntry,
+                                DateTime::now(),
+                                entryPath(event.run, event.recordId)};
+        case SelEvent::Kind::WatchdogRestart:
+            return PendingAlert{Watchdog, AlertOnWatchdog, DateTime::now(),
+                                watchdogPath};
+        case SelEvent::Kind::LogChanged:
+            break;
     }
-}
-
-void IpmiSource::pollOnce()
-{
-    TrackerResult result;
-    try
-    {
-        {
-            const BmcGate::Access access(gate_);
-            refreshTree();
-            SelObservation now;
-            now.records = &cache_.records();
-            now.version = cache_.version();
-            now.info = cache_.info();
-            now.logStatus = logState_ ? logState_->status : nodeStatusOk;
-            now.restartCause = restartCause_;
-            if (tracker_.started())
-            {
-                result = tracker_.observe(now);
-            }
-            else
-            {
-                std::optional<AnnouncedState> kept;
-                if (!alertStateFile_.empty())
-                {
-                    std::string problem;
-                    kept = readAlertState(alertStateFile_, problem);
-                    if (!kept)
-                    {
-                        logLine(logLevelInfo, "IpmiSource", __LINE__,
-                                "No alert state in " + alertStateFile_ + " (" +
-                                    problem +
-                                    "): SEL records present now are not "
-                                    "announced");
-                    }
-                }
-                result = tracker_.start(kept, now);
-            }
-        }
-        if (failing_)
-        {
-            logLine(logLevelInfo, "IpmiSource", __LINE__,
-                    "SEL monitoring reaches the BMC again");
-            failing_ = false;
-        }
-    }
-    catch (const std::exception& error)
-    {
-        // Logged once per outage; the next interval tries again.
-        if (!failing_)
-        {
-            logFailure("SEL monitoring", error);
-            failing_ = true;
-        }
-        polls_.fetch_add(1, std::memory_order_release);
-        return;
-    }
-    if (!result.note.empty())
-    {
-        logLine(logLevelInfo, "IpmiSource", __LINE__, result.note);
-    }
-    dispatcher_.post(std::move(result.alerts));
-    if (result.stateChanged && !alertStateFile_.empty())
-    {
-        try
-        {
-            writeAlertState(alertStateFile_, tracker_.state());
-        }
-        catch (const std::exception& error)
-        {
-            logFailure("Keeping the alert state", error);
-        }
-    }
-    polls_.fetch_add(1, std::memory_order_release);
+    return PendingAlert{EventLog, AlertOnEventLog, DateTime::now(), logPath};
 }
 
 std::size_t IpmiSource::monitorCount(NodeLexicon::NodeType kind) const
 {
-    return dispatcher_.count(kind);
+    return monitor_.count(kind);
 }
 
 bool IpmiSource::polling() const
 {
-    const std::lock_guard lock(pollerMutex_);
-    return poller_.joinable();
+    return monitor_.polling();
 }
 
 std::uint64_t IpmiSource::pollCount() const
 {
-    return polls_.load(std::memory_order_acquire);
+    return monitor_.pollCount();
 }
 
 std::uint64_t IpmiSource::requestCount() const
@@ -386,7 +303,7 @@ std::uint64_t IpmiSource::requestCount() const
 
 bool IpmiSource::waitForAlerts(std::chrono::milliseconds timeout) const
 {
-    return dispatcher_.waitIdle(timeout);
+    return monitor_.waitForAlerts(timeout);
 }
 
 } // namespace QX::Ipmi

@@ -1,6 +1,5 @@
 #include "SelAlertTracker.h"
 
-#include "IpmiSource.h"
 #include "NodeLexicon.h"
 #include "SelRecord.h"
 #include "SelRecordText.h"
@@ -25,9 +24,14 @@ constexpr const char* restartWithoutRecord = "cause-only";
 // A last-erase time of FFFFFFFFh means "never erased" (or "not kept").
 constexpr std::uint32_t noEraseTime = 0xFFFFFFFF;
 
-PendingAlert alert(NodeType kind, unsigned code, std::string path)
+SelEvent logChanged()
 {
-    return PendingAlert{kind, code, DateTime::now(), std::move(path)};
+    return SelEvent{SelEvent::Kind::LogChanged, 0, 0};
+}
+
+SelEvent watchdogRestart()
+{
+    return SelEvent{SelEvent::Kind::WatchdogRestart, 0, 0};
 }
 
 bool isFillStatus(unsigned status)
@@ -87,8 +91,7 @@ TrackerResult SelAlertTracker::start(const std::optional<AnnouncedState>& kept,
     if (kept->lastErase != now.info.mostRecentErase)
     {
         // Cleared meanwhile: one clear, and every record is newer.
-        result.alerts.push_back(
-            alert(EventLog, AlertOnEventLog, IpmiSource::logPath));
+        result.events.push_back(logChanged());
     }
     else if (kept->lastRecord)
     {
@@ -116,12 +119,11 @@ TrackerResult SelAlertTracker::start(const std::optional<AnnouncedState>& kept,
             known_.insert(record.bytes);
         }
     }
-    announceNew(now, result.alerts);
+    announceNew(now, result.events);
 
     if (now.logStatus != kept->logStatus && isFillStatus(now.logStatus))
     {
-        result.alerts.push_back(
-            alert(EventLog, AlertOnEventLog, IpmiSource::logPath));
+        result.events.push_back(logChanged());
     }
     if (now.restartCause == restartCauseWatchdog)
     {
@@ -131,8 +133,7 @@ TrackerResult SelAlertTracker::start(const std::optional<AnnouncedState>& kept,
         const bool recorded = key != restartWithoutRecord;
         if (key != state_.restartKey && (recorded || state_.restartKey.empty()))
         {
-            result.alerts.push_back(
-                alert(Watchdog, AlertOnWatchdog, IpmiSource::watchdogPath));
+            result.events.push_back(watchdogRestart());
             state_.restartKey = key;
         }
     }
@@ -175,15 +176,13 @@ TrackerResult SelAlertTracker::observe(const SelObservation& now)
     const AnnouncedState before = state_;
     if (clearedSince(now))
     {
-        result.alerts.push_back(
-            alert(EventLog, AlertOnEventLog, IpmiSource::logPath));
+        result.events.push_back(logChanged());
         known_.clear();
     }
-    announceNew(now, result.alerts);
+    announceNew(now, result.events);
     if (now.logStatus != state_.logStatus && isFillStatus(now.logStatus))
     {
-        result.alerts.push_back(
-            alert(EventLog, AlertOnEventLog, IpmiSource::logPath));
+        result.events.push_back(logChanged());
     }
     state_.logStatus = now.logStatus;
     lastInfo_ = now.info;
@@ -193,7 +192,7 @@ TrackerResult SelAlertTracker::observe(const SelObservation& now)
 }
 
 void SelAlertTracker::announceNew(const SelObservation& now,
-                                  std::vector<PendingAlert>& out)
+                                  std::vector<SelEvent>& out)
 {
     // Each record seen before accounts for one of equal bytes now.
     std::multiset<SelRecordBytes> unmatched = known_;
@@ -205,12 +204,11 @@ void SelAlertTracker::announceNew(const SelObservation& now,
             unmatched.erase(seen);
             continue;
         }
-        out.push_back(alert(EventLogEntry, AlertOnEventLogEntry,
-                            IpmiSource::entryPath(record.run, record.id)));
+        out.push_back(
+            SelEvent{SelEvent::Kind::RecordAdded, record.run, record.id});
         if (isWatchdogRestart(record.bytes))
         {
-            out.push_back(
-                alert(Watchdog, AlertOnWatchdog, IpmiSource::watchdogPath));
+            out.push_back(watchdogRestart());
             state_.restartKey = recordHex(record.bytes);
         }
     }

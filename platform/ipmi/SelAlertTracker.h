@@ -1,6 +1,5 @@
 #pragma once
 
-#include "AlertDispatcher.h"
 #include "AlertState.h"
 #include "SelCache.h"
 
@@ -23,18 +22,33 @@ struct SelObservation
     std::optional<std::uint8_t> restartCause;
 };
 
-/** The alerts one comparison raises, and whether the state to keep
+/** Something that happened to the SEL, as the tracker announces it. */
+struct SelEvent
+{
+    enum class Kind
+    {
+        RecordAdded,     // a new record: its run and id
+        LogChanged,      // cleared, or a fill transition
+        WatchdogRestart, // a watchdog restart, by record or restart cause
+    };
+    Kind kind = Kind::LogChanged;
+    std::uint32_t run = 0;
+    std::uint16_t recordId = 0;
+    bool operator==(const SelEvent&) const = default;
+};
+
+/** The events one comparison raises, and whether the state to keep
  *  changed. */
 struct TrackerResult
 {
-    std::vector<PendingAlert> alerts;
+    std::vector<SelEvent> events;
     bool stateChanged = false;
     /** Something worth a log line, or empty. */
     std::string note;
 };
 
 /**
- * @brief Turns successive views of the SEL into alerts: each new record
+ * @brief Turns successive views of the SEL into events: each new record
  *        once, a clear once, each fill transition once, each watchdog
  *        restart once.
  *
@@ -77,7 +91,7 @@ class SelAlertTracker
     }
 
   private:
-    void announceNew(const SelObservation& now, std::vector<PendingAlert>& out);
+    void announceNew(const SelObservation& now, std::vector<SelEvent>& out);
     void remember(const SelObservation& now);
     bool clearedSince(const SelObservation& now) const;
     static std::string restartKeyOf(const std::vector<CachedRecord>& records);
