@@ -132,9 +132,12 @@ void SelReader::walkFrom(BmcCommands& bmc, std::uint16_t reservation,
         std::min<std::size_t>(mostRecords, info.entries + walkMargin);
     for (;;)
     {
-        // A record's own id asked again would loop as well.
-        asked[recordIdOf(entry.data)] = true;
-        if (loops(entry.nextRecordId, current, asked))
+        // The first record, asked as 0000h, naming its own id as next
+        // looks like a loop too.
+        const bool selfAfterFirst =
+            current == firstRecordId &&
+            entry.nextRecordId == recordIdOf(entry.data);
+        if (selfAfterFirst || loops(entry.nextRecordId, current, asked))
         {
             // Some BMCs give a wrong next id once; asking again helps.
             entry = fetch(bmc, reservation, current, deadline);

