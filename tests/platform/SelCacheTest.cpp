@@ -2,6 +2,9 @@
 
 #include "platform/FakeBmc.h"
 
+#include <chrono>
+#include <thread>
+
 #include <gtest/gtest.h>
 
 using namespace QX;
@@ -227,6 +230,41 @@ TEST_F(SelCacheTest, AFailedRefreshLeavesTheCopy)
     EXPECT_EQ(cache.records().size(), 3u);
     bmc.failure.reset();
     EXPECT_EQ(cache.refresh(bmc, describer), SelChange::None);
+}
+
+TEST_F(SelCacheTest, VerifyIntervalCatchesWhatNothingElseShows)
+{
+    SelCache verifying(std::chrono::seconds(30), std::chrono::seconds(1));
+    fill(5);
+    verifying.refresh(bmc, describer);
+    // A record in the middle replaced: same count, times and newest record.
+    bmc.sel[2] = selRecord(3, 0x66000000);
+    EXPECT_EQ(verifying.refresh(bmc, describer), SelChange::None);
+    std::this_thread::sleep_for(std::chrono::milliseconds(1050));
+    bmc.resetCounters();
+    EXPECT_EQ(verifying.refresh(bmc, describer), SelChange::Replaced);
+    EXPECT_EQ(verifying.records()[2].bytes, selRecord(3, 0x66000000));
+    EXPECT_EQ(bmc.entryCalls, 5u);
+    // Read again and unchanged: nothing to rebuild.
+    std::this_thread::sleep_for(std::chrono::milliseconds(1050));
+    EXPECT_EQ(verifying.refresh(bmc, describer), SelChange::None);
+}
+
+TEST_F(SelCacheTest, SensorNamesThatCannotBeReadLeaveTheSel)
+{
+    class RefusingDescriber : public CountingDescriber
+    {
+      public:
+        bool refreshSensorNames() override
+        {
+            throw IpmiError("ipmi_sdr_cache_create",
+                            ErrorCategory::CompletionCode, "timeout",
+                            completionTimedOut);
+        }
+    } refusing;
+    fill(3);
+    EXPECT_EQ(cache.refresh(bmc, refusing), SelChange::Replaced);
+    EXPECT_EQ(cache.records().size(), 3u);
 }
 
 } // namespace
