@@ -4,9 +4,7 @@
 #include "IpmiLog.h"
 #include "SelRecordText.h"
 
-#include <algorithm>
 #include <cstdio>
-#include <thread>
 
 namespace QX::Ipmi
 {
