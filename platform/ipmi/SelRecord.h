@@ -4,6 +4,7 @@
 
 #include <array>
 #include <cstdint>
+#include <cstdio>
 #include <optional>
 #include <string>
 #include <string_view>
@@ -80,5 +81,152 @@ struct SelRecord
     }
     bool operator==(const SelRecord&) const = default;
 };
+
+// Defined here: the platform library keeps its internals to itself, and
+// the simulators and tests that build records need them too.
+
+namespace detail
+{
+
+inline int hexDigit(char c)
+{
+    if (c >= '0' && c <= '9')
+    {
+        return c - '0';
+    }
+    if (c >= 'a' && c <= 'f')
+    {
+        return c - 'a' + 10;
+    }
+    if (c >= 'A' && c <= 'F')
+    {
+        return c - 'A' + 10;
+    }
+    return -1;
+}
+
+inline std::string pairs(const SelRecordBytes& bytes, bool blanks)
+{
+    std::string text;
+    text.reserve(bytes.size() * 3);
+    char pair[3];
+    for (const std::uint8_t byte : bytes)
+    {
+        if (blanks && !text.empty())
+        {
+            text += ' ';
+        }
+        std::snprintf(pair, sizeof pair, "%02x", byte);
+        text += pair;
+    }
+    return text;
+}
+
+} // namespace detail
+
+inline SelRecord SelRecord::systemEvent(std::uint16_t recordId,
+                                        std::uint32_t timestamp,
+                                        std::uint8_t sensorType,
+                                        std::uint8_t sensorNumber,
+                                        std::uint8_t eventDirType,
+                                        std::array<std::uint8_t, 3> eventData)
+{
+    SelRecord record;
+    record.recordId = recordId;
+    record.timestamp = timestamp;
+    record.sensorType = sensorType;
+    record.sensorNumber = sensorNumber;
+    record.eventDirType = eventDirType;
+    record.eventData = eventData;
+    return record;
+}
+
+inline SelRecord SelRecord::parse(const SelRecordBytes& bytes)
+{
+    SelRecord record;
+    record.recordId = static_cast<std::uint16_t>(bytes[0] | bytes[1] << 8);
+    record.recordType = bytes[2];
+    record.timestamp = static_cast<std::uint32_t>(bytes[3]) |
+                       static_cast<std::uint32_t>(bytes[4]) << 8 |
+                       static_cast<std::uint32_t>(bytes[5]) << 16 |
+                       static_cast<std::uint32_t>(bytes[6]) << 24;
+    record.generatorId = static_cast<std::uint16_t>(bytes[7] | bytes[8] << 8);
+    record.evmRev = bytes[9];
+    record.sensorType = bytes[10];
+    record.sensorNumber = bytes[11];
+    record.eventDirType = bytes[12];
+    record.eventData = {bytes[13], bytes[14], bytes[15]};
+    return record;
+}
+
+inline std::optional<SelRecord> SelRecord::parseHex(std::string_view text)
+{
+    SelRecordBytes bytes{};
+    std::size_t at = 0;
+    for (std::size_t i = 0; i < bytes.size(); ++i)
+    {
+        if (i > 0 && at < text.size() && text[at] == ' ')
+        {
+            ++at;
+        }
+        if (at + 2 > text.size())
+        {
+            return std::nullopt;
+        }
+        const int high = detail::hexDigit(text[at]);
+        const int low = detail::hexDigit(text[at + 1]);
+        if (high < 0 || low < 0)
+        {
+            return std::nullopt;
+        }
+        bytes[i] = static_cast<std::uint8_t>(high << 4 | low);
+        at += 2;
+    }
+    if (at != text.size())
+    {
+        return std::nullopt;
+    }
+    return parse(bytes);
+}
+
+inline SelRecordBytes SelRecord::bytes() const
+{
+    return {static_cast<std::uint8_t>(recordId),
+            static_cast<std::uint8_t>(recordId >> 8),
+            recordType,
+            static_cast<std::uint8_t>(timestamp),
+            static_cast<std::uint8_t>(timestamp >> 8),
+            static_cast<std::uint8_t>(timestamp >> 16),
+            static_cast<std::uint8_t>(timestamp >> 24),
+            static_cast<std::uint8_t>(generatorId),
+            static_cast<std::uint8_t>(generatorId >> 8),
+            evmRev,
+            sensorType,
+            sensorNumber,
+            eventDirType,
+            eventData[0],
+            eventData[1],
+            eventData[2]};
+}
+
+inline std::string SelRecord::hexOf(const SelRecordBytes& bytes)
+{
+    return detail::pairs(bytes, true);
+}
+
+inline std::string SelRecord::compactHexOf(const SelRecordBytes& bytes)
+{
+    return detail::pairs(bytes, false);
+}
+
+inline std::string SelRecord::hex() const
+{
+    return hexOf(bytes());
+}
+
+inline std::string SelRecord::compactHex() const
+{
+    return compactHexOf(bytes());
+}
 
 } // namespace QX::Ipmi

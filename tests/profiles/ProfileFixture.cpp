@@ -2,7 +2,7 @@
 
 #include "CVLogger.h"
 #include "Platform.h"
-#include "ipmi/SelRecordText.h"
+#include "ipmi/SelRecord.h"
 
 #include <algorithm>
 #include <iterator>
@@ -121,9 +121,9 @@ void ProfileTest::expectEnumerationIsTheSel()
     {
         const host::Instance& entry = outcome.instances[i];
         EXPECT_EQ(text(entry, "RecordID"),
-                  std::to_string(QX::Ipmi::recordIdOf(sel[i])))
+                  std::to_string(QX::Ipmi::SelRecord::parse(sel[i]).recordId))
             << "record " << i;
-        EXPECT_EQ(text(entry, "RecordData"), QX::Ipmi::hexText(sel[i]))
+        EXPECT_EQ(text(entry, "RecordData"), QX::Ipmi::SelRecord::hexOf(sel[i]))
             << "record " << i;
     }
 }
@@ -158,12 +158,13 @@ void ProfileTest::expectEntryEvents(
     for (std::size_t i = 0; i < records.size(); ++i)
     {
         const std::string key =
-            "RecordID=\"" + std::to_string(QX::Ipmi::recordIdOf(records[i])) +
+            "RecordID=\"" +
+            std::to_string(QX::Ipmi::SelRecord::parse(records[i]).recordId) +
             "\"";
         EXPECT_NE(text(entries[i].instance, "AlertingManagedElement").find(key),
                   std::string::npos)
             << "event " << i << " is not for record "
-            << QX::Ipmi::recordIdOf(records[i]);
+            << QX::Ipmi::SelRecord::parse(records[i]).recordId;
     }
 }
 

@@ -3,7 +3,7 @@
 // ends in bounded time.
 
 #include "ProfileFixture.h"
-#include "ipmi/SelRecordText.h"
+#include "ipmi/SelRecord.h"
 
 #include <chrono>
 
@@ -247,7 +247,9 @@ TEST_F(ReadingProfilesTest, BackgroundClearIsWaitedFor)
         << "ClearLog returned before the erase was done";
     const auto sel = bmc->truth();
     ASSERT_EQ(sel.size(), 1u);
-    EXPECT_TRUE(QX::Ipmi::isLogClearedRecord(sel.front()));
+    const auto cleared = QX::Ipmi::SelRecord::parse(sel.front());
+    EXPECT_EQ(cleared.sensorType, 0x10); // Event Logging Disabled
+    EXPECT_EQ(cleared.offset(), 0x02);   // Log Area Reset/Cleared
     expectEnumerationIsTheSel();
 }
 
