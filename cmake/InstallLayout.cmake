@@ -2,8 +2,10 @@
 #   <prefix>/${SELPROV_PROVIDER_DIR}/libSELProvider.so  and libqxplatform.so
 #   <prefix>/bin/selprov
 #   <prefix>/sbin/selprovider-register
-#   <prefix>/share/selprovider/  MOF, registrations, example configuration
+#   <prefix>/share/selprovider/  MOF and registrations
 #   <prefix>/share/doc/selprovider/  deployment guide (and Debian's files)
+#   /etc/qx/platform.conf  the platform configuration (mode 0600)
+#   /var/lib/qx-platform/  the platform's state directory (mode 0700)
 include(GNUInstallDirs)
 
 set(SELPROV_PROVIDER_DIR "lib/cmpi" CACHE STRING
@@ -12,6 +14,10 @@ prefix or absolute: a directory the object manager searches for providers \
 (SFCB providerDirs, OpenPegasus providerDir)")
 set(SELPROV_DATA_DIR "${CMAKE_INSTALL_DATADIR}/selprovider")
 set(SELPROV_DOC_DIR "${CMAKE_INSTALL_DATADIR}/doc/selprovider")
+# The platform reads its configuration from this fixed directory and keeps
+# its state in the other by default, whatever the install prefix.
+set(SELPROV_CONFIG_DIR "/etc/qx")
+set(SELPROV_STATE_DIR "/var/lib/qx-platform")
 
 # The provider directory as seen from another installed directory: relative
 # to it when both are under the prefix (so the installation can be moved,

@@ -24,13 +24,16 @@ struct AlertChain
     std::atomic<CMPI_THREAD_TYPE>* handle;
 };
 
-/** Writes what an exception says where a thread of ours ends it. */
-void reportEscaped(const std::exception* error) noexcept
+/** Writes what an exception says where a thread of ours ends it: on
+ *  standard error and, as a failure, in the log. */
+void reportEscaped(const char* function, const std::exception* error) noexcept
 {
     try
     {
-        std::cerr << (error != nullptr ? error->what() : "unknown exception")
-                  << std::endl;
+        const char* const what =
+            error != nullptr ? error->what() : "unknown exception";
+        std::cerr << what << std::endl;
+        traceMessage(function, __LINE__, LOG_LEVEL_FAILURE, what);
     }
     catch (...)
     {
@@ -161,11 +164,11 @@ void runAlertHandler(const AlertChain& chain, unsigned int alertCode,
     }
     catch (const std::exception& error)
     {
-        reportEscaped(&error);
+        reportEscaped(chain.handlerName, &error);
     }
     catch (...)
     {
-        reportEscaped(nullptr);
+        reportEscaped(chain.handlerName, nullptr);
     }
 }
 
@@ -185,11 +188,11 @@ void runDeliveryThread(const char* name,
     }
     catch (const std::exception& error)
     {
-        reportEscaped(&error);
+        reportEscaped(name, &error);
     }
     catch (...)
     {
-        reportEscaped(nullptr);
+        reportEscaped(name, nullptr);
     }
     indicationActivity.threadFinishing();
 }

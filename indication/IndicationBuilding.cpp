@@ -248,6 +248,7 @@ bool walkInstrumentation(const char* function,
     catch (const std::exception& error)
     {
         std::cerr << error.what() << std::endl;
+        traceMessage(function, __LINE__, LOG_LEVEL_FAILURE, error.what());
     }
     traceExit(function, __LINE__);
     return found;

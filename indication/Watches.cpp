@@ -1,5 +1,6 @@
 #include "Watches.h"
 
+#include "IndicationTrace.h"
 #include "Instrumentation.h"
 #include "Platform.h"
 
@@ -14,9 +15,9 @@ namespace
 {
 
 /** Runs @p change on the platform's current source; an exception is
- *  written to standard error. */
+ *  written to standard error and logged as a failure of @p function. */
 template <typename Change>
-void onCurrentSource(Change change)
+void onCurrentSource(const char* function, Change change)
 {
     try
     {
@@ -25,6 +26,8 @@ void onCurrentSource(Change change)
     catch (const std::exception& error)
     {
         std::cerr << error.what() << std::endl;
+        indication::traceMessage(function, __LINE__, LOG_LEVEL_FAILURE,
+                                 error.what());
     }
 }
 
@@ -33,6 +36,7 @@ void onCurrentSource(Change change)
 void Watches::start(NodeLexicon::NodeType kind, MonitorCallback handler)
 {
     onCurrentSource(
+        "Watches::start",
         [&](const auto& source)
         {
             Instrumentation(source).startMonitoring(kind, handler, nullptr);
@@ -44,6 +48,7 @@ void Watches::start(NodeLexicon::NodeType kind, MonitorCallback handler)
 void Watches::stop(NodeLexicon::NodeType kind, MonitorCallback handler)
 {
     onCurrentSource(
+        "Watches::stop",
         [&](const auto& source)
         {
             Instrumentation(source).stopMonitoring(kind, handler, nullptr);

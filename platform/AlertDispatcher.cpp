@@ -1,10 +1,11 @@
 #include "AlertDispatcher.h"
 
+#include "FailureReport.h"
+
 #include <algorithm>
 #include <condition_variable>
 #include <cstdint>
 #include <deque>
-#include <iostream>
 #include <mutex>
 
 namespace QX
@@ -102,11 +103,14 @@ void AlertDispatcher::State::handOut(std::unique_lock<std::mutex>& lock,
         catch (const std::exception& error)
         {
             // A callback's failure must not end the dispatcher.
-            std::cerr << error.what() << std::endl;
+            Platform::reportFailure("AlertDispatcher", __LINE__,
+                                    std::string("monitor callback failed: ") +
+                                        error.what());
         }
         catch (...)
         {
-            std::cerr << "unknown exception in a monitor callback" << std::endl;
+            Platform::reportFailure("AlertDispatcher", __LINE__,
+                                    "unknown exception in a monitor callback");
         }
         lock.lock();
         running = 0;

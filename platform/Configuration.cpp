@@ -3,7 +3,7 @@
  * blank lines and lines starting with '#' are ignored, blanks around keys
  * and values are dropped, a later setting of a key replaces an earlier one.
  *
- *   source         = memory | ipmi
+ *   source         = ipmi | memory  (default ipmi: the server's own BMC)
  *   memory.fixture = PATH           (empty: the built-in sample SEL)
  *   ipmi.*         = ...            (the BMC; see README.md)
  *   log.sink       = syslog | stderr | none | file:PATH

@@ -1,12 +1,12 @@
 #include "Platform.h"
 
 #include "CVLogger.h"
+#include "FailureReport.h"
 #include "Fixture.h"
 #include "MemorySource.h"
 #include "Resources.h"
 #include "ipmi/IpmiSourceFactory.h"
 
-#include <iostream>
 #include <mutex>
 #include <sstream>
 #include <stdexcept>
@@ -129,7 +129,7 @@ std::shared_ptr<InstrumentationSource> currentSource()
         const std::string reason =
             std::string("instrumentation platform unavailable: ") +
             error.what();
-        std::cerr << reason << std::endl;
+        reportFailure("currentSource", __LINE__, reason);
         throw std::runtime_error(reason);
     }
     return activeSource;

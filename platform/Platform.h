@@ -17,10 +17,12 @@ constexpr const char* configurationPathVariable = "QX_PLATFORM_CONFIG";
 /** The settings of the platform configuration file (see README.md). */
 struct Configuration
 {
-    /** "memory": the in-memory source, from fixtureFile or, when that is
-     *  empty, the built-in sample SEL; "ipmi": the BMC, with the ipmi
-     *  settings. */
-    std::string source = "memory";
+    /** "ipmi" (the default): the server's BMC, with the ipmi settings, in
+     *  band unless they say otherwise; "memory": the in-memory source, from
+     *  fixtureFile or, when that is empty, the built-in sample SEL. The
+     *  sample is served only where a configuration asks for it: on a
+     *  server, made-up events would pass for real ones. */
+    std::string source = "ipmi";
     std::string fixtureFile;
     Ipmi::Settings ipmi;
     /** The file these settings were read from; empty for the defaults. */

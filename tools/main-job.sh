@@ -71,8 +71,9 @@ echo "\$ ipmitool sel info  (the BMC's own view after ClearLog)"
 ipmitool -I lanplus -H 127.0.0.1 -p "${host##*:}" -U admin -P password -C 3 \
     sel info | grep -E '^(Entries|Last Del Time)'
 
-# The in-memory sample SEL needs no BMC: a configuration without a source
-# (or source = memory) uses it.
+# The in-memory sample SEL needs no BMC, and is served only where a
+# configuration says source = memory (without one the platform reads the
+# server's own BMC in band).
 echo
 echo "\$ selprov --config memory.conf enumerate ZAN_MgmtHwLog --properties Name,CurrentNumberOfRecords"
 printf 'source = memory\n' >"$bench/memory.conf"

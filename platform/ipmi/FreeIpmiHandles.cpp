@@ -19,6 +19,15 @@ ErrorCategory completionCategory(std::uint8_t code)
                                             : ErrorCategory::CompletionCode;
 }
 
+// What a request reports on a machine without an in-band BMC (no IPMI
+// device, or the kernel driver not loaded): one line that says what is
+// missing and the two ways to fix it.
+constexpr const char* noInbandBmc =
+    "no in-band BMC on this machine (no IPMI device such as /dev/ipmi0): "
+    "load the kernel's IPMI driver (modprobe ipmi_si ipmi_devintf), or "
+    "reach the BMC over the network with ipmi.interface = lan and "
+    "ipmi.host in the platform configuration (/etc/qx/platform.conf)";
+
 } // namespace
 
 ErrorCategory categoryOf(int ipmiErrnum)
@@ -126,9 +135,14 @@ IpmiContext::IpmiContext(const SessionParameters& parameters) :
                         "out of memory");
     }
     ipmi_ctx_t context = context_.get();
-    const auto failOpen = [context](const char* call)
+    const bool inBand = !parameters.lan;
+    const auto failOpen = [context, inBand](const char* call)
     {
         const int errnum = ipmi_ctx_errnum(context);
+        if (inBand && errnum == IPMI_ERR_DEVICE_NOT_FOUND)
+        {
+            throw IpmiError(call, ErrorCategory::Other, noInbandBmc);
+        }
         throw IpmiError(call, categoryOf(errnum),
                         text(ipmi_ctx_errormsg(context)));
     };
@@ -163,8 +177,7 @@ IpmiContext::IpmiContext(const SessionParameters& parameters) :
         if (found == 0)
         {
             throw IpmiError("ipmi_ctx_find_inband", ErrorCategory::Other,
-                            "no in-band IPMI device found (is the ipmi_si or "
-                            "ipmi_devintf kernel module loaded?)");
+                            noInbandBmc);
         }
         return;
     }

@@ -61,7 +61,7 @@ struct SessionParameters
     unsigned sessionTimeoutMs = 5000;
     unsigned retransmissionTimeoutMs = 500;
     unsigned workaroundFlags = 0;
-    // Run each exchange on a helper thread and give up after
+    // Run each exchange on the session's worker thread and give up after
     // guardTimeoutMs (the session timeout when 0). Always on in-band.
     bool guardExchanges = false;
     unsigned guardTimeoutMs = 0;

@@ -3,10 +3,8 @@
 #include "IpmiLog.h"
 
 #include <algorithm>
-#include <condition_variable>
 #include <exception>
-#include <mutex>
-#include <thread>
+#include <type_traits>
 
 namespace QX::Ipmi
 {
@@ -71,14 +69,6 @@ IpmiSession::IpmiSession(SessionParameters parameters) :
 {
 }
 
-struct IpmiSession::PendingCall
-{
-    std::mutex mutex;
-    std::condition_variable finished;
-    bool done = false;
-    std::exception_ptr error;
-};
-
 std::string IpmiSession::peerName() const
 {
     if (parameters_.lan)
@@ -115,17 +105,12 @@ std::string IpmiSession::peerKey() const
 
 std::shared_ptr<IpmiContext> IpmiSession::open()
 {
-    if (abandoned_)
+    if (worker_ && worker_->busy())
     {
-        const std::lock_guard lock(abandoned_->mutex);
-        if (!abandoned_->done)
-        {
-            throw IpmiError("IPMI exchange", ErrorCategory::Busy,
-                            "the driver has not yet returned from an "
-                            "exchange given up on after the timeout");
-        }
+        throw IpmiError("IPMI exchange", ErrorCategory::Busy,
+                        "the driver has not yet returned from an "
+                        "exchange given up on after the timeout");
     }
-    abandoned_.reset();
     if (context_)
     {
         const Clock::time_point last{
@@ -179,60 +164,58 @@ void IpmiSession::noteFailure(const IpmiError& error)
 }
 
 template <typename Result, typename Work>
-Result IpmiSession::guardedCall(const std::shared_ptr<IpmiContext>& context,
-                                Work work)
+Result IpmiSession::onWorker(const std::shared_ptr<IpmiContext>& context,
+                             Work work)
 {
-    // The helper owns what it touches, so it may outlive this call (and
-    // this session) when the driver does not return in time.
-    auto call = std::make_shared<PendingCall>();
+    // What the job touches it owns, so it may outlive this call when the
+    // driver does not return in time.
     using Stored = std::conditional_t<std::is_void_v<Result>, bool, Result>;
-    auto result = std::make_shared<std::optional<Stored>>();
-    std::thread(
-        [call, context, result, work]() mutable
+    struct Outcome
+    {
+        std::optional<Stored> value;
+        std::exception_ptr error;
+    };
+    auto outcome = std::make_shared<Outcome>();
+    auto job = [outcome, context, work]() mutable
+    {
+        try
         {
-            try
+            if constexpr (std::is_void_v<Result>)
             {
-                if constexpr (std::is_void_v<Result>)
-                {
-                    work(*context);
-                    result->emplace(true);
-                }
-                else
-                {
-                    result->emplace(work(*context));
-                }
+                work(*context);
+                outcome->value.emplace(true);
             }
-            catch (...)
+            else
             {
-                call->error = std::current_exception();
+                outcome->value.emplace(work(*context));
             }
-            {
-                const std::lock_guard lock(call->mutex);
-                call->done = true;
-            }
-            call->finished.notify_all();
-        })
-        .detach();
-
+        }
+        catch (...)
+        {
+            outcome->error = std::current_exception();
+        }
+    };
+    if (!worker_)
+    {
+        worker_.emplace();
+    }
     const auto timeout = std::chrono::milliseconds(
         parameters_.guardTimeoutMs != 0 ? parameters_.guardTimeoutMs
                                         : parameters_.sessionTimeoutMs);
-    std::unique_lock lock(call->mutex);
-    if (!call->finished.wait_for(lock, timeout, [&call] { return call->done; }))
+    if (!worker_->run(std::move(job), timeout))
     {
-        lock.unlock();
-        abandoned_ = call;
         throw IpmiError("IPMI exchange", ErrorCategory::Timeout,
                         "no answer from the driver within " +
                             std::to_string(timeout.count()) + " ms");
     }
-    if (call->error)
+    // The worker finished the job: its outcome is ours alone now.
+    if (outcome->error)
     {
-        std::rethrow_exception(call->error);
+        std::rethrow_exception(outcome->error);
     }
     if constexpr (!std::is_void_v<Result>)
     {
-        return std::move(**result);
+        return std::move(*outcome->value);
     }
 }
 
@@ -247,13 +230,13 @@ Result IpmiSession::exchange(Work work)
         {
             if constexpr (std::is_void_v<Result>)
             {
-                guardedCall<void>(context, work);
+                onWorker<void>(context, work);
                 touch();
                 return;
             }
             else
             {
-                Result result = guardedCall<Result>(context, work);
+                Result result = onWorker<Result>(context, work);
                 touch();
                 return result;
             }
@@ -279,9 +262,9 @@ Result IpmiSession::exchange(Work work)
 
 void IpmiSession::run(const std::function<void(IpmiContext&)>& work)
 {
-    // Not guarded: the work uses its caller's state, which must not be
-    // left to a helper thread. The SDR cache code it runs makes single
-    // driver calls bounded by the driver.
+    // Not on the worker: the work uses its caller's state, which must not
+    // be left to the worker after a timeout. The SDR cache code it runs
+    // makes single driver calls bounded by the driver.
     const std::shared_ptr<IpmiContext> context = open();
     try
     {

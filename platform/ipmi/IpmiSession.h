@@ -1,6 +1,7 @@
 #pragma once
 
 #include "BmcCommands.h"
+#include "ExchangeWorker.h"
 #include "FreeIpmiHandles.h"
 
 #include <atomic>
@@ -26,11 +27,16 @@ namespace QX::Ipmi
  * failure throws IpmiError at once.
  *
  * In-band drivers wait on the BMC with timeouts of their own, longer than
- * the configured one. So in-band exchanges run on a helper thread that
- * shares the context, and the caller waits at most the timeout: then it
- * throws (Timeout) and leaves the context to the helper. Until the driver
- * returns, further exchanges fail at once (Busy); afterwards a new context
- * is opened.
+ * the configured one. So in-band exchanges run on the session's one worker
+ * thread (ExchangeWorker), started with the first exchange, and the caller
+ * waits at most the timeout: then it throws (Timeout) and leaves the
+ * context to the worker. Until the driver returns, further exchanges fail
+ * at once (Busy); afterwards a new context is opened. The worker is joined
+ * when the session ends. A driver call it is stuck in still ends on its
+ * own, so that join is bounded: FreeIPMI's in-band drivers limit each wait
+ * themselves (the one for the kernel's IPMI device waits at most 60 s for
+ * an answer). Opening an in-band context takes no timeout, so that limit
+ * cannot be made shorter from here.
  *
  * Not thread-safe: callers serialize every member except lastActivity(),
  * sessionGeneration() and requestCount(), which any thread may read.
@@ -68,13 +74,11 @@ class IpmiSession : public BmcCommands
     std::string peerKey() const;
 
   private:
-    struct PendingCall;
-
     std::shared_ptr<IpmiContext> open();
     template <typename Result, typename Work>
     Result exchange(Work work);
     template <typename Result, typename Work>
-    Result guardedCall(const std::shared_ptr<IpmiContext>& context, Work work);
+    Result onWorker(const std::shared_ptr<IpmiContext>& context, Work work);
     void touch();
     /** After a failed exchange: closes the session when it was lost. */
     void noteFailure(const IpmiError& error);
@@ -83,11 +87,12 @@ class IpmiSession : public BmcCommands
     std::chrono::milliseconds reopenAfter_;
     bool guarded_;
     std::shared_ptr<IpmiContext> context_;
-    std::shared_ptr<PendingCall> abandoned_; // still inside the driver
     bool lost_ = false; // the last session ended in a failure
     std::atomic<std::uint64_t> generation_{0};
     std::atomic<std::uint64_t> requests_{0};    // exchanges sent
     std::atomic<std::int64_t> lastActivity_{0}; // steady clock, ns
+    // Last, so that it is joined before the context goes.
+    std::optional<ExchangeWorker> worker_;
 };
 
 } // namespace QX::Ipmi

@@ -291,7 +291,9 @@ void completeSettings(Settings& settings, const std::string& configurationFile)
         throw std::runtime_error("ipmi.host is set but ipmi.interface is "
                                  "inband (set ipmi.interface = lan)");
     }
-    if (settings.retransmissionTimeoutMs >= settings.timeoutMs)
+    // Retransmission is the LAN's: an in-band timeout below its default
+    // is fine.
+    if (lan && settings.retransmissionTimeoutMs >= settings.timeoutMs)
     {
         throw std::runtime_error(
             "ipmi.retransmission-timeout must be below ipmi.timeout");

@@ -39,6 +39,28 @@ class IndicationDelivery : public IndicationTest
     }
 };
 
+TEST_F(IndicationDelivery, AFailedHardwareReadIsAFailureInTheLog)
+{
+    subscribe(restartEvent);
+    enable();
+    source->armFault({QX::CursorOperation::SelectPath, 0, false, "BMC gone"});
+    ::testing::internal::CaptureStderr();
+    source->raiseAlert("/bmc0/wdt", alertTime);
+    settle();
+    const std::string written = ::testing::internal::GetCapturedStderr();
+    EXPECT_NE(written.find("BMC gone"), std::string::npos) << written;
+    unsigned logged = 0;
+    for (const auto& line : linesWith("BMC gone"))
+    {
+        EXPECT_EQ(line.level, 6000);
+        EXPECT_EQ(line.component, "Corvane.SELProvider");
+        EXPECT_EQ(line.function, "getAutoServerInstrumentation");
+        logged += line.channel == CVLog::Channel::Log ? 1 : 0;
+    }
+    EXPECT_EQ(logged, 1u);
+    EXPECT_EQ(calls(BrokerCall::DeliverIndication), 0u);
+}
+
 TEST_F(IndicationDelivery, AlertsWhileDisabledStartNoThread)
 {
     subscribe(entryEvent);

@@ -102,6 +102,33 @@ TEST_F(Selprov, SampleLogIsServed)
         << log.output;
 }
 
+TEST_F(Selprov, WithoutASourceNoSampleAndOneLineSayingWhatIsMissing)
+{
+    if (std::filesystem::exists("/dev/ipmi0"))
+    {
+        GTEST_SKIP() << "this machine has an in-band IPMI device";
+    }
+    // A configuration that names no source: the platform's defaults.
+    writeConfig("defaults.conf", "log.sink = none\n");
+    const std::string errors = (directory_ / "errors.txt").string();
+    // Standard error into a file of its own, standard output captured.
+    const CommandResult entries =
+        run("sh -c '" + selprov("defaults.conf") +
+            "enumerate ZAN_MgmtHwLogEntry 2>" + errors + "'");
+    EXPECT_EQ(entries.exitCode, 0);
+    EXPECT_EQ(entries.output, "");
+    std::ifstream in(errors);
+    std::string line;
+    ASSERT_TRUE(std::getline(in, line));
+    EXPECT_NE(line.find("no in-band BMC on this machine"), std::string::npos)
+        << line;
+    EXPECT_NE(line.find("modprobe ipmi_si ipmi_devintf"), std::string::npos)
+        << line;
+    EXPECT_EQ(line.find("CPU1 Temp"), std::string::npos);
+    std::string more;
+    EXPECT_FALSE(std::getline(in, more)) << more;
+}
+
 TEST_F(Selprov, EntriesCanBeListedAndFetchedByPath)
 {
     const CommandResult names =
@@ -175,8 +202,8 @@ TEST_F(Selprov, LargeGeneratedLogIsServedWhole)
         run(std::string(SELPROV_BIN_DIR) + "/selfixture 65535 > " + fixture)
             .exitCode,
         0);
-    writeConfig("big.conf",
-                "memory.fixture = " + fixture + "\nlog.sink = none\n");
+    writeConfig("big.conf", "source = memory\nmemory.fixture = " + fixture +
+                                "\nlog.sink = none\n");
     const CommandResult names =
         run(selprov("big.conf") + "enumerate-names ZAN_MgmtHwLogEntry");
     EXPECT_EQ(names.exitCode, 0);
@@ -260,8 +287,8 @@ TEST_F(Selprov, BrokenFixtureIsReportedNotCrashed)
 {
     const std::string fixture = (directory_ / "broken.fixture").string();
     std::ofstream(fixture) << "controller path=/bmc0 status=x\n";
-    writeConfig("broken.conf",
-                "memory.fixture = " + fixture + "\nlog.sink = none\n");
+    writeConfig("broken.conf", "source = memory\nmemory.fixture = " + fixture +
+                                   "\nlog.sink = none\n");
     const CommandResult result =
         run(selprov("broken.conf") + "enumerate ZAN_MgmtHwLogEntry", true);
     EXPECT_EQ(result.exitCode, 0) << "an empty answer, as for a dead BMC";

@@ -1,4 +1,5 @@
 #include "MemorySource.h"
+#include "platform/CapturedLog.h"
 #include "platform/TestTrees.h"
 
 #include <atomic>
@@ -225,6 +226,32 @@ TEST_F(AlertDispatcherTest, ACallbackThatThrowsDoesNotStopTheOthers)
     source->raiseAlert("/bmc0/wdt", DateTime());
     ASSERT_TRUE(source->waitForAlerts(patience));
     EXPECT_EQ(seen_.paths.size(), 2u);
+}
+
+TEST_F(AlertDispatcherTest, ACallbackThatThrowsIsAFailureInTheLog)
+{
+    const CVLog::LoggerSettings previous = CVLog::CVLogger::settings();
+    CVLog::CVLogger::configure(CVLog::LoggerSettings{});
+    const test::CapturedLog log;
+    source->startMonitoring(Watchdog, &throwing, nullptr);
+    ::testing::internal::CaptureStderr();
+    source->raiseAlert("/bmc0/wdt", DateTime());
+    const bool handedOut = source->waitForAlerts(patience);
+    const std::string written = ::testing::internal::GetCapturedStderr();
+    CVLog::CVLogger::configure(previous);
+    ASSERT_TRUE(handedOut);
+    EXPECT_NE(written.find("callback failed"), std::string::npos) << written;
+    int failures = 0;
+    for (const auto& record : log.records())
+    {
+        if (record.message.find("callback failed") != std::string::npos)
+        {
+            EXPECT_EQ(record.level, 6000);
+            EXPECT_EQ(record.component, "QX.Platform");
+            ++failures;
+        }
+    }
+    EXPECT_EQ(failures, 1);
 }
 
 TEST_F(AlertDispatcherTest, EveryRegistrationOfATripleIsCalled)

@@ -4,6 +4,7 @@
 #include "Instrumentation.h"
 #include "MemorySource.h"
 #include "Resources.h"
+#include "platform/CapturedLog.h"
 #include "platform/ConfigurationFiles.h"
 #include "platform/EnvironmentGuard.h"
 #include "platform/TestTrees.h"
@@ -49,7 +50,9 @@ class PlatformTest : public ::testing::Test
 TEST(Configuration, DefaultsWhenEmpty)
 {
     const auto configuration = Platform::parseConfiguration("", "x");
-    EXPECT_EQ(configuration.source, "memory");
+    // The server's own BMC, never the built-in sample.
+    EXPECT_EQ(configuration.source, "ipmi");
+    EXPECT_EQ(configuration.ipmi.interface, Ipmi::Interface::InBand);
     EXPECT_EQ(configuration.fixtureFile, "");
     EXPECT_EQ(configuration.logSink, "syslog");
     EXPECT_EQ(configuration.logLevel, 6000);
@@ -174,7 +177,7 @@ TEST_F(PlatformTest, CurrentSourceBuildsFromTheConfiguredFixture)
 
 TEST_F(PlatformTest, EmptyFixtureSettingUsesTheBuiltInSample)
 {
-    const TempFile configuration("log.sink = none\n");
+    const TempFile configuration("source = memory\nlog.sink = none\n");
     environment_.set(Platform::configurationPathVariable, configuration.path());
     Platform::overrideSource(nullptr);
     Instrumentation cursor;
@@ -205,10 +208,36 @@ TEST_F(PlatformTest, BrokenConfigurationFailsEveryCursor)
     EXPECT_THAT(written, HasSubstr("source must be one of: memory"));
 }
 
+TEST_F(PlatformTest, UnavailablePlatformIsAFailureInTheLog)
+{
+    const TempFile configuration("source = bmc\n");
+    environment_.set(Platform::configurationPathVariable, configuration.path());
+    Platform::overrideSource(nullptr);
+    CVLog::CVLogger::configure(CVLog::LoggerSettings{});
+    const test::CapturedLog log;
+    ::testing::internal::CaptureStderr();
+    EXPECT_THROW(Platform::currentSource(), std::runtime_error);
+    ::testing::internal::GetCapturedStderr();
+    int failures = 0;
+    for (const auto& record : log.records())
+    {
+        if (record.message.find("instrumentation platform unavailable") !=
+            std::string::npos)
+        {
+            EXPECT_EQ(record.channel, CVLog::Channel::Log);
+            EXPECT_EQ(record.level, 6000);
+            EXPECT_EQ(record.component, "QX.Platform");
+            EXPECT_THAT(record.message, HasSubstr("source must be one of"));
+            ++failures;
+        }
+    }
+    EXPECT_EQ(failures, 1);
+}
+
 TEST_F(PlatformTest, MissingFixtureFileFailsWithItsName)
 {
-    const TempFile configuration(
-        "log.sink = none\nmemory.fixture = /nonexistent/sel.fixture\n");
+    const TempFile configuration("source = memory\nlog.sink = none\n"
+                                 "memory.fixture = /nonexistent/sel.fixture\n");
     environment_.set(Platform::configurationPathVariable, configuration.path());
     Platform::overrideSource(nullptr);
     ::testing::internal::CaptureStderr();
@@ -246,7 +275,7 @@ TEST_F(PlatformTest, TheConfiguredLocaleChoosesTheLanguage)
 
 TEST_F(PlatformTest, OverrideSourceReplacesAndNullRereads)
 {
-    const TempFile configuration("log.sink = none\n");
+    const TempFile configuration("source = memory\nlog.sink = none\n");
     environment_.set(Platform::configurationPathVariable, configuration.path());
     const auto memory =
         std::make_shared<MemorySource>(test::twoControllerTree());
