@@ -1,5 +1,6 @@
 #include "Fixture.h"
 #include "NodeLexicon.h"
+#include "ipmi/SelRecord.h"
 
 #include <array>
 #include <cstdio>
@@ -73,37 +74,12 @@ constexpr std::time_t recordSpacing = 97;
 std::string formatRecordData(unsigned recordId, std::time_t when,
                              const EventPattern& pattern)
 {
-    const auto seconds = static_cast<std::uint32_t>(when);
-    const unsigned char bytes[16] = {
-        static_cast<unsigned char>(recordId & 0xff),
-        static_cast<unsigned char>((recordId >> 8) & 0xff),
-        0x02,
-        static_cast<unsigned char>(seconds & 0xff),
-        static_cast<unsigned char>((seconds >> 8) & 0xff),
-        static_cast<unsigned char>((seconds >> 16) & 0xff),
-        static_cast<unsigned char>((seconds >> 24) & 0xff),
-        0x20,
-        0x00,
-        0x04,
-        pattern.sensorType,
-        pattern.sensorNumber,
-        pattern.eventType,
-        pattern.data[0],
-        pattern.data[1],
-        pattern.data[2],
-    };
-    std::string text;
-    char pair[4];
-    for (const unsigned char byte : bytes)
-    {
-        std::snprintf(pair, sizeof pair, "%02x", byte);
-        if (!text.empty())
-        {
-            text += ' ';
-        }
-        text += pair;
-    }
-    return text;
+    return Ipmi::SelRecord::systemEvent(
+               static_cast<std::uint16_t>(recordId),
+               static_cast<std::uint32_t>(when), pattern.sensorType,
+               pattern.sensorNumber, pattern.eventType,
+               {pattern.data[0], pattern.data[1], pattern.data[2]})
+        .hex();
 }
 
 } // namespace

@@ -1,6 +1,7 @@
 #include "MemorySource.h"
 
 #include "NodeLexicon.h"
+#include "ipmi/SelRecord.h"
 
 #include <algorithm>
 #include <cstdio>
@@ -326,32 +327,12 @@ namespace
  *  BMC at @p when. */
 std::string bootRecordData(unsigned recordId, std::time_t when)
 {
-    const auto seconds = static_cast<std::uint32_t>(when);
-    const unsigned bytes[16] = {recordId & 0xffu,
-                                (recordId >> 8) & 0xffu,
-                                0x02,
-                                seconds & 0xffu,
-                                (seconds >> 8) & 0xffu,
-                                (seconds >> 16) & 0xffu,
-                                seconds >> 24,
-                                0x20,
-                                0x00,
-                                0x04,
-                                0x12,
-                                0x83,
-                                0x6f,
-                                0x01,
-                                0xff,
-                                0xff};
-    std::string text;
-    for (const unsigned byte : bytes)
-    {
-        char hex[4];
-        std::snprintf(hex, sizeof hex, "%02x", byte);
-        text += text.empty() ? "" : " ";
-        text += hex;
-    }
-    return text;
+    // System Event sensor (12h) 83h, sensor-specific, offset 01h: OEM
+    // system boot event.
+    return Ipmi::SelRecord::systemEvent(static_cast<std::uint16_t>(recordId),
+                                        static_cast<std::uint32_t>(when), 0x12,
+                                        0x83, 0x6f, {0x01, 0xff, 0xff})
+        .hex();
 }
 
 } // namespace

@@ -1,5 +1,7 @@
 #include "AlertState.h"
 
+#include "SelRecord.h"
+
 #include <cerrno>
 #include <cstdio>
 #include <cstring>
@@ -18,35 +20,15 @@ namespace
 
 constexpr const char* noRecord = "none";
 
-int hexDigit(char c)
-{
-    if (c >= '0' && c <= '9')
-    {
-        return c - '0';
-    }
-    if (c >= 'a' && c <= 'f')
-    {
-        return c - 'a' + 10;
-    }
-    return -1;
-}
-
 bool parseRecord(const std::string& text, SelRecordBytes& record)
 {
-    if (text.size() != record.size() * 2)
+    // The file keeps the pairs without blanks.
+    const std::optional<SelRecord> parsed = SelRecord::parseHex(text);
+    if (text.size() != record.size() * 2 || !parsed)
     {
         return false;
     }
-    for (std::size_t i = 0; i < record.size(); ++i)
-    {
-        const int high = hexDigit(text[2 * i]);
-        const int low = hexDigit(text[2 * i + 1]);
-        if (high < 0 || low < 0)
-        {
-            return false;
-        }
-        record[i] = static_cast<std::uint8_t>(high << 4 | low);
-    }
+    record = parsed->bytes();
     return true;
 }
 
@@ -98,14 +80,7 @@ void closeQuietly(int fd)
 
 std::string recordHex(const SelRecordBytes& record)
 {
-    std::string text;
-    char pair[3];
-    for (const std::uint8_t byte : record)
-    {
-        std::snprintf(pair, sizeof pair, "%02x", byte);
-        text += pair;
-    }
-    return text;
+    return SelRecord::compactHexOf(record);
 }
 
 std::string formatAlertState(const AnnouncedState& state)

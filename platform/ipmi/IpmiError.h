@@ -69,8 +69,11 @@ class IpmiError : public std::runtime_error
 };
 
 /** Completion codes the SEL code acts on. */
+constexpr std::uint8_t completionEraseInProgress = 0x81;
 constexpr std::uint8_t completionInvalidCommand = 0xC1;
+constexpr std::uint8_t completionTimedOut = 0xC3;
 constexpr std::uint8_t completionReservationCancelled = 0xC5;
 constexpr std::uint8_t completionRecordNotPresent = 0xCB;
+constexpr std::uint8_t completionInsufficientPrivilege = 0xD4;
 
 } // namespace QX::Ipmi

@@ -273,6 +273,14 @@ std::string applySetting(Settings& settings, const std::string& key,
         }
         settings.selWraps = value == "yes";
     }
+    else if (key == "ipmi.clear-wait")
+    {
+        return number(key, value, 1000, 600000, settings.clearWaitMs);
+    }
+    else if (key == "ipmi.sel-verify-interval")
+    {
+        return number(key, value, 0, 604800, settings.selVerifySeconds);
+    }
     else if (key == "ipmi.state-directory")
     {
         settings.stateDirectory = value;

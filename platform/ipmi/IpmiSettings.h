@@ -45,6 +45,8 @@ struct Settings
     SelClock selClock = SelClock::Utc;
     unsigned selCapacity = 0; // records; 0: from Get SEL Info
     bool selWraps = false;
+    unsigned clearWaitMs = 30000;     // how long a clear may take to finish
+    unsigned selVerifySeconds = 3600; // full re-read of the SEL; 0: never
     std::string stateDirectory = "/var/lib/qx-platform";
 };
 

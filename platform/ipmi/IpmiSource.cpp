@@ -1,13 +1,10 @@
 #include "IpmiSource.h"
 
-#include "AlertState.h"
 #include "IpmiError.h"
 #include "IpmiLog.h"
 #include "SelRecordText.h"
 
-#include <algorithm>
 #include <cstdio>
-#include <thread>
 
 namespace QX::Ipmi
 {
@@ -17,18 +14,7 @@ namespace
 
 using namespace NodeLexicon;
 
-// Get SEL Info's free space field is 16 bits: FFFFh means "65535 bytes or
-// more", 4095 more records of 16 bytes at the least.
-constexpr std::uint16_t freeSpaceAtLeast = 0xFFFF;
-constexpr unsigned recordBytes = 16;
-constexpr std::uint32_t noEraseYet = 0xFFFFFFFF;
 constexpr unsigned nodeStatusOk = 1;
-
-// Raw OverwritePolicy values: 1 wraps when full, 2 never overwrites.
-constexpr unsigned overwriteWraps = 1;
-constexpr unsigned overwriteNever = 2;
-
-constexpr auto erasePollInterval = std::chrono::milliseconds(20);
 
 void logFailure(const char* what, const std::exception& error)
 {
@@ -48,7 +34,12 @@ IpmiSource::IpmiSource(std::unique_ptr<BmcCommands> bmc,
     controllerDescription_(std::move(controllerDescription)),
     gate_(std::chrono::milliseconds(settings.timeoutMs),
           [bmc = bmc_.get()] { return bmc->lastActivity(); }),
-    alertStateFile_(std::move(alertStateFile))
+    cache_(std::chrono::milliseconds(settings.clearWaitMs),
+           std::chrono::seconds(settings.selVerifySeconds)),
+    monitor_([this](const std::function<void(const SelObservation&)>& use)
+             { look(use); },
+             alertOf, std::chrono::milliseconds(settings.pollIntervalMs),
+             std::move(alertStateFile))
 {
     // The password is not needed beyond the session.
     settings_.password.clear();
@@ -59,7 +50,7 @@ IpmiSource::IpmiSource(std::unique_ptr<BmcCommands> bmc,
 // session.
 IpmiSource::~IpmiSource()
 {
-    stopPoller(true);
+    monitor_.stop();
     describer_.reset();
 }
 
@@ -110,7 +101,8 @@ std::shared_ptr<const NodeTree> IpmiSource::refreshTree()
         }
         builderChanged_ = true;
     }
-    const LogState state = logState();
+    const LogState state = logStateOf(cache_.info(), cache_.records(),
+                                      cache_.clearSeen(), settings_);
     if (!logState_ || state != *logState_)
     {
         applyLogState(state);
@@ -153,59 +145,6 @@ void IpmiSource::addEntry(const CachedRecord& record)
     builder_.setProperty(path, RecordData, hexText(record.bytes));
     builder_.setProperty(path, Timestamp,
                          timestampText(record.bytes, settings_.selClock));
-}
-
-IpmiSource::LogState IpmiSource::logState() const
-{
-    const SelInfo& info = cache_.info();
-    const auto& records = cache_.records();
-    const auto count = static_cast<unsigned>(records.size());
-
-    LogState state;
-    bool noRoomLeft = info.overflow;
-    if (settings_.selCapacity != 0)
-    {
-        state.maxRecords = settings_.selCapacity;
-    }
-    else if (info.freeSpace == freeSpaceAtLeast)
-    {
-        state.maxRecords = count + freeSpaceAtLeast / recordBytes;
-    }
-    else
-    {
-        state.maxRecords = count + info.freeSpace / recordBytes;
-        noRoomLeft = noRoomLeft || info.freeSpace < recordBytes;
-    }
-    state.maxRecords = std::max(state.maxRecords, count);
-    state.overwritePolicy =
-        settings_.selWraps ? overwriteWraps : overwriteNever;
-    // BMCs log "Log Area Reset/Cleared" right after a clear: a log that
-    // holds only that record has been emptied.
-    state.isEmpty =
-        records.empty() ||
-        (records.size() == 1 && isLogClearedRecord(records.front().bytes));
-    const bool erased =
-        info.mostRecentErase != 0 && info.mostRecentErase != noEraseYet;
-
-    if (noRoomLeft || count >= state.maxRecords)
-    {
-        state.status = EventLogStatusFull;
-    }
-    else if (static_cast<std::uint64_t>(count) * 100 >=
-             static_cast<std::uint64_t>(settings_.warningFillPercent) *
-                 state.maxRecords)
-    {
-        state.status = EventLogStatusAlmostFull;
-    }
-    else if (state.isEmpty && erased)
-    {
-        state.status = EventLogStatusCleared;
-    }
-    else
-    {
-        state.status = nodeStatusOk;
-    }
-    return state;
 }
 
 void IpmiSource::applyLogState(const LogState& state)
@@ -290,42 +229,7 @@ bool IpmiSource::writeProperty(const std::string& path,
 
 void IpmiSource::clearSel()
 {
-    // The copy no longer matches the SEL, whatever happens below.
-    cache_.invalidate();
-    const SelInfo info = bmc_->getSelInfo();
-    for (unsigned attempt = 1;; ++attempt)
-    {
-        const std::uint16_t reservation =
-            info.reserveSupported ? bmc_->reserveSel() : 0;
-        try
-        {
-            bmc_->initiateSelErase(reservation);
-            const auto deadline =
-                std::chrono::steady_clock::now() +
-                std::chrono::milliseconds(settings_.timeoutMs);
-            while (!bmc_->selEraseCompleted(reservation))
-            {
-                if (std::chrono::steady_clock::now() >= deadline)
-                {
-                    throw IpmiError("Clear SEL", ErrorCategory::Timeout,
-                                    "the BMC did not finish erasing within " +
-                                        std::to_string(settings_.timeoutMs) +
-                                        " ms");
-                }
-                std::this_thread::sleep_for(erasePollInterval);
-            }
-            return;
-        }
-        catch (const IpmiError& error)
-        {
-            // Another client reserved the SEL in between: reserve again.
-            if (error.completionCode() != completionReservationCancelled ||
-                attempt >= SelCache::walkAttempts)
-            {
-                throw;
-            }
-        }
-    }
+    cache_.erase(*bmc_);
 }
 
 std::string IpmiSource::printablePath(const std::string& path) const
@@ -336,142 +240,58 @@ std::string IpmiSource::printablePath(const std::string& path) const
 void IpmiSource::startMonitoring(NodeLexicon::NodeType kind,
                                  MonitorCallback callback, const void* context)
 {
-    dispatcher_.add(kind, callback, context);
-    const std::lock_guard lock(pollerMutex_);
-    if (!poller_.joinable() && dispatcher_.total() > 0)
-    {
-        poller_ = std::jthread([this](const std::stop_token& stop)
-                               { pollLoop(stop); });
-    }
+    monitor_.add(kind, callback, context);
 }
 
 void IpmiSource::stopMonitoring(NodeLexicon::NodeType kind,
                                 MonitorCallback callback, const void* context)
 {
-    // Not under the poller lock: this waits for a running callback, which
-    // may itself start or stop monitoring.
-    dispatcher_.remove(kind, callback, context);
-    if (dispatcher_.total() == 0)
-    {
-        stopPoller(false);
-    }
+    monitor_.remove(kind, callback, context);
 }
 
-void IpmiSource::stopPoller(bool evenIfMonitored)
+void IpmiSource::look(const std::function<void(const SelObservation&)>& use)
 {
-    const std::lock_guard lock(pollerMutex_);
-    if (!poller_.joinable() || (!evenIfMonitored && dispatcher_.total() > 0))
-    {
-        return;
-    }
-    poller_.request_stop();
-    if (poller_.get_id() == std::this_thread::get_id())
-    {
-        poller_.detach(); // cannot happen: callbacks run elsewhere
-        return;
-    }
-    // A poll in progress ends within the BMC timeout.
-    poller_.join();
+    const BmcGate::Access access(gate_);
+    refreshTree();
+    SelObservation now;
+    now.records = &cache_.records();
+    now.version = cache_.version();
+    now.info = cache_.info();
+    now.logStatus = logState_ ? logState_->status : nodeStatusOk;
+    now.restartCause = restartCause_;
+    use(now);
 }
 
-void IpmiSource::pollLoop(const std::stop_token& stop)
+PendingAlert IpmiSource::alertOf(const SelEvent& event)
 {
-    const auto interval = std::chrono::milliseconds(settings_.pollIntervalMs);
-    while (!stop.stop_requested())
+    switch (event.kind)
     {
-        pollOnce();
-        std::unique_lock lock(waitMutex_);
-        wake_.wait_for(lock, stop, interval, [] { return false; });
+        case SelEvent::Kind::RecordAdded:
+            return PendingAlert{EventLogEntry, AlertOnEventLogEntry,
+                                DateTime::now(),
+                                entryPath(event.run, event.recordId)};
+        case SelEvent::Kind::WatchdogRestart:
+            return PendingAlert{Watchdog, AlertOnWatchdog, DateTime::now(),
+                                watchdogPath};
+        case SelEvent::Kind::LogChanged:
+            break;
     }
-}
-
-void IpmiSource::pollOnce()
-{
-    TrackerResult result;
-    try
-    {
-        {
-            const BmcGate::Access access(gate_);
-            refreshTree();
-            SelObservation now;
-            now.records = &cache_.records();
-            now.info = cache_.info();
-            now.logStatus = logState_ ? logState_->status : nodeStatusOk;
-            now.restartCause = restartCause_;
-            if (tracker_.started())
-            {
-                result = tracker_.observe(now);
-            }
-            else
-            {
-                std::optional<AnnouncedState> kept;
-                if (!alertStateFile_.empty())
-                {
-                    std::string problem;
-                    kept = readAlertState(alertStateFile_, problem);
-                    if (!kept)
-                    {
-                        logLine(logLevelInfo, "IpmiSource", __LINE__,
-                                "No alert state in " + alertStateFile_ + " (" +
-                                    problem +
-                                    "): SEL records present now are not "
-                                    "announced");
-                    }
-                }
-                result = tracker_.start(kept, now);
-            }
-        }
-        if (failing_)
-        {
-            logLine(logLevelInfo, "IpmiSource", __LINE__,
-                    "SEL monitoring reaches the BMC again");
-            failing_ = false;
-        }
-    }
-    catch (const std::exception& error)
-    {
-        // Logged once per outage; the next interval tries again.
-        if (!failing_)
-        {
-            logFailure("SEL monitoring", error);
-            failing_ = true;
-        }
-        polls_.fetch_add(1, std::memory_order_release);
-        return;
-    }
-    if (!result.note.empty())
-    {
-        logLine(logLevelInfo, "IpmiSource", __LINE__, result.note);
-    }
-    dispatcher_.post(std::move(result.alerts));
-    if (result.stateChanged && !alertStateFile_.empty())
-    {
-        try
-        {
-            writeAlertState(alertStateFile_, tracker_.state());
-        }
-        catch (const std::exception& error)
-        {
-            logFailure("Keeping the alert state", error);
-        }
-    }
-    polls_.fetch_add(1, std::memory_order_release);
+    return PendingAlert{EventLog, AlertOnEventLog, DateTime::now(), logPath};
 }
 
 std::size_t IpmiSource::monitorCount(NodeLexicon::NodeType kind) const
 {
-    return dispatcher_.count(kind);
+    return monitor_.count(kind);
 }
 
 bool IpmiSource::polling() const
 {
-    const std::lock_guard lock(pollerMutex_);
-    return poller_.joinable();
+    return monitor_.polling();
 }
 
 std::uint64_t IpmiSource::pollCount() const
 {
-    return polls_.load(std::memory_order_acquire);
+    return monitor_.pollCount();
 }
 
 std::uint64_t IpmiSource::requestCount() const
@@ -481,7 +301,7 @@ std::uint64_t IpmiSource::requestCount() const
 
 bool IpmiSource::waitForAlerts(std::chrono::milliseconds timeout) const
 {
-    return dispatcher_.waitIdle(timeout);
+    return monitor_.waitForAlerts(timeout);
 }
 
 } // namespace QX::Ipmi

@@ -1,24 +1,19 @@
 #pragma once
 
-#include "AlertDispatcher.h"
 #include "BmcCommands.h"
 #include "BmcGate.h"
 #include "InstrumentationSource.h"
 #include "IpmiSettings.h"
 #include "NodeTree.h"
 #include "RecordDescriber.h"
-#include "SelAlertTracker.h"
 #include "SelCache.h"
+#include "SelFill.h"
+#include "SelMonitor.h"
 
-#include <atomic>
-#include <condition_variable>
+#include <functional>
 #include <memory>
-#include <mutex>
 #include <optional>
-#include <stop_token>
 #include <string>
-#include <thread>
-#include <vector>
 
 namespace QX::Ipmi
 {
@@ -39,19 +34,12 @@ namespace QX::Ipmi
  * The SEL copy and the session are meant to be shared by everything in
  * the process that reads the BMC, alert polling included.
  *
- * Monitoring: the first registration starts one poller thread, the last
- * one removed stops and joins it (so does the destructor). Every poll
- * interval the poller refreshes the shared SEL copy (one Get SEL Info
- * while nothing changes) and SelAlertTracker turns the differences into
- * alerts: code 2 on the entry node of each new record, in SEL order;
- * code 0 on the log node for a clear and for each fill transition
- * (status 21, 24); code 1 on the watchdog node for a watchdog-restart
- * record, or at the first poll when the restart cause says watchdog and
- * that restart was not announced yet. Callbacks run on the dispatcher's
- * thread, so a slow or throwing one does not hold up polling. What was
- * announced is kept in the alert state file (written atomically) so that
- * a restarted process announces what happened meanwhile, once. BMC
- * failures are logged once per outage; the poller keeps trying.
+ * Monitoring is SelMonitor's: its poller looks at the SEL through this
+ * source (the same copy, under the same gate) and the source turns the
+ * SEL events it finds into alerts on its nodes: code 2 on the entry node
+ * of each new record, code 0 on the log node for a clear and for each
+ * fill transition (status 21, 24), code 1 on the watchdog node for a
+ * watchdog restart.
  */
 class IpmiSource : public InstrumentationSource
 {
@@ -105,26 +93,20 @@ class IpmiSource : public InstrumentationSource
      *  as the SEL orders its records. */
     static std::string entryPath(std::uint32_t run, std::uint16_t recordId);
 
+    /** The alert a SEL event raises on this source's nodes: code 2 on the
+     *  record's entry node, code 0 on the log node, code 1 on the watchdog
+     *  node. */
+    static PendingAlert alertOf(const SelEvent& event);
+
   private:
-    struct LogState
-    {
-        unsigned maxRecords = 0;
-        unsigned overwritePolicy = 0;
-        bool isEmpty = true;
-        unsigned status = 0;
-        bool operator==(const LogState&) const = default;
-    };
     std::shared_ptr<const NodeTree> refreshTree();
     void rebuildEntries();
     void addEntry(const CachedRecord& record);
-    LogState logState() const;
     void applyLogState(const LogState& state);
     void refreshRestartCause(bool selChanged);
     void applyRestartCause();
     void clearSel();
-    void pollLoop(const std::stop_token& stop);
-    void pollOnce();
-    void stopPoller(bool evenIfMonitored);
+    void look(const std::function<void(const SelObservation&)>& use);
 
     // Declared before the describer, which may refer to it.
     std::unique_ptr<BmcCommands> bmc_;
@@ -142,17 +124,7 @@ class IpmiSource : public InstrumentationSource
     std::optional<std::uint8_t> restartCause_;
     std::optional<std::uint64_t> restartCauseGeneration_;
 
-    // Used by the poller thread only (one at a time).
-    SelAlertTracker tracker_;
-    std::string alertStateFile_;
-    bool failing_ = false;
-
-    AlertDispatcher dispatcher_;
-    std::atomic<std::uint64_t> polls_{0};
-    mutable std::mutex pollerMutex_; // starting and stopping the poller
-    std::mutex waitMutex_;           // the poller's wait between polls
-    std::condition_variable_any wake_;
-    std::jthread poller_; // last: stopped before the rest goes
+    SelMonitor monitor_; // last: its poller stops before the rest goes
 };
 
 } // namespace QX::Ipmi

@@ -1,7 +1,7 @@
 #include "SelAlertTracker.h"
 
-#include "IpmiSource.h"
 #include "NodeLexicon.h"
+#include "SelRecord.h"
 #include "SelRecordText.h"
 
 #include <algorithm>
@@ -14,7 +14,6 @@ namespace
 
 using namespace NodeLexicon;
 
-constexpr std::uint8_t systemEventRecord = 0x02;
 constexpr std::uint8_t sensorTypeWatchdog2 = 0x23;
 constexpr std::uint8_t sensorSpecificReading = 0x6f;
 // Watchdog 2 offsets: 1 hard reset, 2 power down, 3 power cycle.
@@ -22,10 +21,17 @@ constexpr std::uint8_t firstRestartOffset = 1;
 constexpr std::uint8_t lastRestartOffset = 3;
 // Restart key when the BMC reports a watchdog restart without a record.
 constexpr const char* restartWithoutRecord = "cause-only";
+// A last-erase time of FFFFFFFFh means "never erased" (or "not kept").
+constexpr std::uint32_t noEraseTime = 0xFFFFFFFF;
 
-PendingAlert alert(NodeType kind, unsigned code, std::string path)
+SelEvent logChanged()
 {
-    return PendingAlert{kind, code, DateTime::now(), std::move(path)};
+    return SelEvent{SelEvent::Kind::LogChanged, 0, 0};
+}
+
+SelEvent watchdogRestart()
+{
+    return SelEvent{SelEvent::Kind::WatchdogRestart, 0, 0};
 }
 
 bool isFillStatus(unsigned status)
@@ -37,12 +43,11 @@ bool isFillStatus(unsigned status)
 
 bool SelAlertTracker::isWatchdogRestart(const SelRecordBytes& record)
 {
-    const bool asserted = (record[12] & 0x80) == 0;
-    const std::uint8_t offset = record[13] & 0x0F;
-    return record[2] == systemEventRecord &&
-           record[10] == sensorTypeWatchdog2 &&
-           (record[12] & 0x7F) == sensorSpecificReading && asserted &&
-           offset >= firstRestartOffset && offset <= lastRestartOffset;
+    const SelRecord fields = SelRecord::parse(record);
+    return fields.isSystemEvent() && fields.sensorType == sensorTypeWatchdog2 &&
+           fields.eventType() == sensorSpecificReading && fields.asserted() &&
+           fields.offset() >= firstRestartOffset &&
+           fields.offset() <= lastRestartOffset;
 }
 
 std::string
@@ -86,8 +91,7 @@ TrackerResult SelAlertTracker::start(const std::optional<AnnouncedState>& kept,
     if (kept->lastErase != now.info.mostRecentErase)
     {
         // Cleared meanwhile: one clear, and every record is newer.
-        result.alerts.push_back(
-            alert(EventLog, AlertOnEventLog, IpmiSource::logPath));
+        result.events.push_back(logChanged());
     }
     else if (kept->lastRecord)
     {
@@ -115,12 +119,11 @@ TrackerResult SelAlertTracker::start(const std::optional<AnnouncedState>& kept,
             known_.insert(record.bytes);
         }
     }
-    announceNew(now, result.alerts);
+    announceNew(now, result.events);
 
     if (now.logStatus != kept->logStatus && isFillStatus(now.logStatus))
     {
-        result.alerts.push_back(
-            alert(EventLog, AlertOnEventLog, IpmiSource::logPath));
+        result.events.push_back(logChanged());
     }
     if (now.restartCause == restartCauseWatchdog)
     {
@@ -130,8 +133,7 @@ TrackerResult SelAlertTracker::start(const std::optional<AnnouncedState>& kept,
         const bool recorded = key != restartWithoutRecord;
         if (key != state_.restartKey && (recorded || state_.restartKey.empty()))
         {
-            result.alerts.push_back(
-                alert(Watchdog, AlertOnWatchdog, IpmiSource::watchdogPath));
+            result.events.push_back(watchdogRestart());
             state_.restartKey = key;
         }
     }
@@ -141,28 +143,46 @@ TrackerResult SelAlertTracker::start(const std::optional<AnnouncedState>& kept,
     return result;
 }
 
+bool SelAlertTracker::clearedSince(const SelObservation& now) const
+{
+    if (now.info.mostRecentErase != lastInfo_.mostRecentErase &&
+        now.info.mostRecentErase != noEraseTime)
+    {
+        return true;
+    }
+    if (known_.empty())
+    {
+        return false;
+    }
+    const std::vector<CachedRecord>& records = *now.records;
+    const bool allGone =
+        std::none_of(records.begin(), records.end(),
+                     [this](const CachedRecord& record)
+                     { return known_.count(record.bytes) != 0; });
+    return allGone &&
+           (records.empty() || isLogClearedRecord(records.front().bytes));
+}
+
 TrackerResult SelAlertTracker::observe(const SelObservation& now)
 {
     TrackerResult result;
-    if (now.info.sameRecordsAs(lastInfo_) &&
-        now.logStatus == state_.logStatus &&
-        now.records->size() == known_.size())
+    if (now.version == lastVersion_ &&
+        now.info.mostRecentErase == lastInfo_.mostRecentErase &&
+        now.logStatus == state_.logStatus)
     {
         lastInfo_ = now.info;
         return result;
     }
     const AnnouncedState before = state_;
-    if (now.info.mostRecentErase != lastInfo_.mostRecentErase)
+    if (clearedSince(now))
     {
-        result.alerts.push_back(
-            alert(EventLog, AlertOnEventLog, IpmiSource::logPath));
+        result.events.push_back(logChanged());
         known_.clear();
     }
-    announceNew(now, result.alerts);
+    announceNew(now, result.events);
     if (now.logStatus != state_.logStatus && isFillStatus(now.logStatus))
     {
-        result.alerts.push_back(
-            alert(EventLog, AlertOnEventLog, IpmiSource::logPath));
+        result.events.push_back(logChanged());
     }
     state_.logStatus = now.logStatus;
     lastInfo_ = now.info;
@@ -172,20 +192,23 @@ TrackerResult SelAlertTracker::observe(const SelObservation& now)
 }
 
 void SelAlertTracker::announceNew(const SelObservation& now,
-                                  std::vector<PendingAlert>& out)
+                                  std::vector<SelEvent>& out)
 {
+    // Each record seen before accounts for one of equal bytes now.
+    std::multiset<SelRecordBytes> unmatched = known_;
     for (const CachedRecord& record : *now.records)
     {
-        if (known_.count(record.bytes) != 0)
+        const auto seen = unmatched.find(record.bytes);
+        if (seen != unmatched.end())
         {
+            unmatched.erase(seen);
             continue;
         }
-        out.push_back(alert(EventLogEntry, AlertOnEventLogEntry,
-                            IpmiSource::entryPath(record.run, record.id)));
+        out.push_back(
+            SelEvent{SelEvent::Kind::RecordAdded, record.run, record.id});
         if (isWatchdogRestart(record.bytes))
         {
-            out.push_back(
-                alert(Watchdog, AlertOnWatchdog, IpmiSource::watchdogPath));
+            out.push_back(watchdogRestart());
             state_.restartKey = recordHex(record.bytes);
         }
     }
@@ -210,6 +233,7 @@ void SelAlertTracker::remember(const SelObservation& now)
     state_.lastAddition = now.info.mostRecentAddition;
     state_.lastErase = now.info.mostRecentErase;
     lastInfo_ = now.info;
+    lastVersion_ = now.version;
 }
 
 } // namespace QX::Ipmi

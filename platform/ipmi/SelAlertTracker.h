@@ -1,6 +1,5 @@
 #pragma once
 
-#include "AlertDispatcher.h"
 #include "AlertState.h"
 #include "SelCache.h"
 
@@ -16,23 +15,40 @@ namespace QX::Ipmi
 struct SelObservation
 {
     const std::vector<CachedRecord>* records = nullptr;
+    /** Changes whenever the records do (SelCache::version). */
+    std::uint64_t version = 0;
     SelInfo info;
     unsigned logStatus = 0;
     std::optional<std::uint8_t> restartCause;
 };
 
-/** The alerts one comparison raises, and whether the state to keep
+/** Something that happened to the SEL, as the tracker announces it. */
+struct SelEvent
+{
+    enum class Kind
+    {
+        RecordAdded,     // a new record: its run and id
+        LogChanged,      // cleared, or a fill transition
+        WatchdogRestart, // a watchdog restart, by record or restart cause
+    };
+    Kind kind = Kind::LogChanged;
+    std::uint32_t run = 0;
+    std::uint16_t recordId = 0;
+    bool operator==(const SelEvent&) const = default;
+};
+
+/** The events one comparison raises, and whether the state to keep
  *  changed. */
 struct TrackerResult
 {
-    std::vector<PendingAlert> alerts;
+    std::vector<SelEvent> events;
     bool stateChanged = false;
     /** Something worth a log line, or empty. */
     std::string note;
 };
 
 /**
- * @brief Turns successive views of the SEL into alerts: each new record
+ * @brief Turns successive views of the SEL into events: each new record
  *        once, a clear once, each fill transition once, each watchdog
  *        restart once.
  *
@@ -40,7 +56,14 @@ struct TrackerResult
  * everything present counts as already announced) and announces what
  * happened meanwhile; observe() compares each later view with the one
  * before. Records are compared by their 16 bytes, which hold id and
- * timestamp, because record ids start again after some BMC restarts.
+ * timestamp, because record ids start again after some BMC restarts and
+ * ring buffers reuse them; how often equal bytes occur counts too.
+ *
+ * A clear is announced when the last-erase time moves to a real time, or,
+ * for BMCs whose Get SEL Info times never move, when every record seen
+ * before is gone and the SEL is empty or its first new record is the
+ * "log cleared" one. Records that were overwritten (a ring buffer) or ids
+ * that started again give no clear.
  * Not thread-safe.
  */
 class SelAlertTracker
@@ -68,14 +91,16 @@ class SelAlertTracker
     }
 
   private:
-    void announceNew(const SelObservation& now, std::vector<PendingAlert>& out);
+    void announceNew(const SelObservation& now, std::vector<SelEvent>& out);
     void remember(const SelObservation& now);
+    bool clearedSince(const SelObservation& now) const;
     static std::string restartKeyOf(const std::vector<CachedRecord>& records);
 
     bool started_ = false;
     AnnouncedState state_;
     SelInfo lastInfo_;
-    std::set<SelRecordBytes> known_;
+    std::uint64_t lastVersion_ = 0;
+    std::multiset<SelRecordBytes> known_;
 };
 
 } // namespace QX::Ipmi

@@ -3,6 +3,7 @@
 #include "IpmiError.h"
 #include "SelRecordText.h"
 
+#include <algorithm>
 #include <string>
 
 namespace QX::Ipmi
@@ -11,31 +12,11 @@ namespace QX::Ipmi
 namespace
 {
 
-// A SEL holds at most 65535 records (16-bit ids, 0 and FFFFh reserved);
-// a walk that goes on longer loops in a faulty next-record chain.
-constexpr std::size_t longestWalk = 0xFFFF;
-
-bool reservationCancelled(const IpmiError& error)
+// Whether @p records hold nothing but the "log cleared" record BMCs write
+// after an erase.
+bool emptied(const std::vector<SelRecordBytes>& records)
 {
-    return error.completionCode() == completionReservationCancelled;
-}
-
-bool recordMissing(const IpmiError& error)
-{
-    return error.completionCode() == completionRecordNotPresent;
-}
-
-std::uint16_t reserve(BmcCommands& bmc, const SelInfo& info)
-{
-    // Reservation 0 is what BMCs without Reserve SEL take for whole-record
-    // reads.
-    return info.reserveSupported ? bmc.reserveSel() : 0;
-}
-
-[[noreturn]] void walkTooLong()
-{
-    throw IpmiError("Get SEL Entry", ErrorCategory::Other,
-                    "the SEL's next-record ids do not end");
+    return std::all_of(records.begin(), records.end(), isLogClearedRecord);
 }
 
 } // namespace
@@ -43,28 +24,35 @@ std::uint16_t reserve(BmcCommands& bmc, const SelInfo& info)
 SelChange SelCache::refresh(BmcCommands& bmc, RecordDescriber& describer)
 {
     const SelInfo info = bmc.getSelInfo();
-    const bool newSession = bmc.sessionGeneration() != sessionGeneration_;
-    const bool namesChanged = describer.refreshSensorNames();
-    sessionGeneration_ = bmc.sessionGeneration();
+    bool namesChanged = false;
+    try
+    {
+        namesChanged = describer.refreshSensorNames();
+    }
+    catch (const IpmiError& error)
+    {
+        // An SDR the BMC will not hand out costs sensor names, not the SEL.
+        if (error.category() != ErrorCategory::CompletionCode)
+        {
+            throw;
+        }
+    }
+    const bool verifyDue =
+        verifyEvery_.count() > 0 &&
+        std::chrono::steady_clock::now() - lastWholeRead_ >= verifyEvery_;
 
     SelChange change = SelChange::Replaced;
     // The first and the last branch both read everything, for different
     // reasons.
-    if (!trusted_)
+    if (!trusted_ || verifyDue)
     { // NOLINT(bugprone-branch-clone)
-        readAll(bmc, info, describer);
+        change = readAll(bmc, info, describer) ? SelChange::Replaced
+                                               : SelChange::None;
     }
-    else if (info.sameRecordsAs(info_))
+    else if (unchanged(bmc, info))
     {
-        if (newSession && !lastRecordUnchanged(bmc))
-        {
-            readAll(bmc, info, describer);
-        }
-        else
-        {
-            info_ = info;
-            change = SelChange::None;
-        }
+        info_ = info;
+        change = SelChange::None;
     }
     else if (info.mostRecentErase == info_.mostRecentErase &&
              info.entries > info_.entries && !records_.empty() &&
@@ -74,7 +62,8 @@ SelChange SelCache::refresh(BmcCommands& bmc, RecordDescriber& describer)
     }
     else
     {
-        readAll(bmc, info, describer);
+        change = readAll(bmc, info, describer) ? SelChange::Replaced
+                                               : SelChange::None;
     }
 
     if (namesChanged && change != SelChange::Replaced)
@@ -85,145 +74,128 @@ SelChange SelCache::refresh(BmcCommands& bmc, RecordDescriber& describer)
         }
         change = SelChange::Replaced;
     }
+    if (change != SelChange::None)
+    {
+        ++version_;
+    }
     return change;
 }
 
-bool SelCache::lastRecordUnchanged(BmcCommands& bmc)
+void SelCache::erase(BmcCommands& bmc)
 {
-    if (records_.empty())
+    // The copy no longer matches the SEL, whatever happens below.
+    trusted_ = false;
+    reader_.erase(bmc);
+    clearSeen_ = true;
+}
+
+bool SelCache::unchanged(BmcCommands& bmc, const SelInfo& info)
+{
+    if (!info.sameRecordsAs(info_))
+    {
+        return false;
+    }
+    if (info.entries == 0 && records_.empty())
     {
         return true;
     }
-    try
-    {
-        const CachedRecord& last = records_.back();
-        return bmc.getSelEntry(reserve(bmc, info_), last.id).data == last.bytes;
-    }
-    catch (const IpmiError& error)
-    {
-        if (recordMissing(error) || reservationCancelled(error))
-        {
-            return false;
-        }
-        throw;
-    }
+    // Same count and times; the newest record tells whether records were
+    // replaced all the same.
+    const std::optional<SelRecordBytes> newest = reader_.newest(bmc);
+    return records_.empty() ? !newest
+                            : newest && *newest == records_.back().bytes;
 }
 
 bool SelCache::readAdded(BmcCommands& bmc, const SelInfo& info,
                          RecordDescriber& describer)
 {
-    std::vector<SelRecordBytes> added;
-    try
+    const CachedRecord& last = records_.back();
+    const std::optional<SelWalk> added =
+        reader_.readAfter(bmc, info, last.id, last.bytes);
+    if (!added || !added->complete)
     {
-        const std::uint16_t reservation = reserve(bmc, info);
-        const CachedRecord& last = records_.back();
-        const SelEntry again = bmc.getSelEntry(reservation, last.id);
-        if (again.data != last.bytes)
-        {
-            return false;
-        }
-        for (std::uint16_t next = again.nextRecordId; next != lastRecordId;)
-        {
-            if (records_.size() + added.size() >= longestWalk)
-            {
-                walkTooLong();
-            }
-            const SelEntry entry = bmc.getSelEntry(reservation, next);
-            added.push_back(entry.data);
-            next = entry.nextRecordId;
-        }
+        return false;
     }
-    catch (const IpmiError& error)
-    {
-        // Let a whole read sort out cancelled reservations and records
-        // that went away.
-        if (recordMissing(error) || reservationCancelled(error))
-        {
-            return false;
-        }
-        throw;
-    }
-
     SelInfo after = info;
-    if (records_.size() + added.size() != info.entries)
+    if (records_.size() + added->records.size() != info.entries)
     {
         // Records may have arrived during the walk: then the SEL info
         // says so now.
         after = bmc.getSelInfo();
         if (after.mostRecentErase != info_.mostRecentErase ||
-            records_.size() + added.size() != after.entries)
+            records_.size() + added->records.size() != after.entries)
         {
             return false;
         }
     }
     firstNew_ = records_.size();
-    for (const SelRecordBytes& bytes : added)
+    for (const SelRecordBytes& bytes : added->records)
     {
         append(bytes, describer);
+    }
+    if (!emptied(added->records))
+    {
+        clearSeen_ = false;
     }
     info_ = after;
     return true;
 }
 
-void SelCache::readAll(BmcCommands& bmc, SelInfo info,
+bool SelCache::readAll(BmcCommands& bmc, SelInfo info,
                        RecordDescriber& describer)
 {
     trusted_ = false;
-    std::vector<SelRecordBytes> walked;
+    const bool firstRead =
+        lastWholeRead_ == std::chrono::steady_clock::time_point{};
+    SelWalk walk;
     for (unsigned attempt = 1;; ++attempt)
     {
-        walked.clear();
-        try
-        {
-            if (info.entries > 0)
-            {
-                const std::uint16_t reservation = reserve(bmc, info);
-                for (std::uint16_t next = firstRecordId; next != lastRecordId;)
-                {
-                    if (walked.size() >= longestWalk)
-                    {
-                        walkTooLong();
-                    }
-                    const SelEntry entry = bmc.getSelEntry(reservation, next);
-                    walked.push_back(entry.data);
-                    next = entry.nextRecordId;
-                }
-            }
-        }
-        catch (const IpmiError& error)
-        {
-            const bool emptied = recordMissing(error) && walked.empty();
-            if (!emptied)
-            {
-                if (!reservationCancelled(error) || attempt >= walkAttempts)
-                {
-                    throw;
-                }
-                info = bmc.getSelInfo();
-                continue;
-            }
-        }
+        walk = reader_.readAll(bmc, info);
         const SelInfo after = bmc.getSelInfo();
         const bool consistent =
-            after.sameRecordsAs(info) || after.entries == walked.size();
+            after.sameRecordsAs(info) || after.entries == walk.records.size();
         if (consistent || attempt >= walkAttempts)
         {
-            // When the SEL kept changing, keep what was read but read it
-            // all again next time.
+            // When the SEL kept changing, or the chain could not be
+            // followed to its end, keep what was read but read it all
+            // again next time.
             info_ = after;
-            trusted_ = consistent;
+            trusted_ = consistent && walk.complete;
             break;
         }
         info = after;
     }
+    lastWholeRead_ = std::chrono::steady_clock::now();
 
+    const bool same =
+        std::equal(records_.begin(), records_.end(), walk.records.begin(),
+                   walk.records.end(),
+                   [](const CachedRecord& kept, const SelRecordBytes& read)
+                   { return kept.bytes == read; });
+    if (same)
+    {
+        return firstRead;
+    }
+    const bool hadRecords =
+        std::any_of(records_.begin(), records_.end(),
+                    [](const CachedRecord& record)
+                    { return !isLogClearedRecord(record.bytes); });
+    if (emptied(walk.records))
+    {
+        clearSeen_ = clearSeen_ || hadRecords;
+    }
+    else
+    {
+        clearSeen_ = false;
+    }
     records_.clear();
-    records_.reserve(walked.size());
+    records_.reserve(walk.records.size());
     firstNew_ = 0;
-    for (const SelRecordBytes& bytes : walked)
+    for (const SelRecordBytes& bytes : walk.records)
     {
         append(bytes, describer);
     }
+    return true;
 }
 
 void SelCache::append(const SelRecordBytes& bytes, RecordDescriber& describer)
@@ -236,7 +208,15 @@ void SelCache::append(const SelRecordBytes& bytes, RecordDescriber& describer)
         const CachedRecord& previous = records_.back();
         record.run = previous.run + (record.id <= previous.id ? 1 : 0);
     }
-    record.description = describer.describe(bytes);
+    try
+    {
+        record.description = describer.describe(bytes);
+    }
+    catch (const std::exception&)
+    {
+        // A record nothing can interpret keeps its bytes and a plain text.
+        record.description = fallbackDescription(bytes);
+    }
     records_.push_back(std::move(record));
 }
 

@@ -2,7 +2,9 @@
 
 #include "BmcCommands.h"
 #include "RecordDescriber.h"
+#include "SelReader.h"
 
+#include <chrono>
 #include <cstdint>
 #include <string>
 #include <vector>
@@ -34,27 +36,44 @@ enum class SelChange
  * @brief The process's copy of the BMC's SEL, kept current with as few
  *        exchanges as the BMC allows.
  *
- * Every refresh asks Get SEL Info. When entries, last addition and last
- * erase are unchanged the records are kept (after a new session, which
- * may face a restarted BMC, the last record is read once more to check
- * it). When only entries were added, the last known record is read again
- * and the walk goes on from its next-record id, reading only the new
- * records. Anything else (an erase, deleted or overwritten records, a last
- * record that changed, a count that does not add up) reads the whole SEL
- * again. A whole read restarts when the SEL reservation is cancelled
- * (completion code C5h) or the SEL changes under it, at most
- * walkAttempts times.
+ * Every refresh asks Get SEL Info and reads the newest record (Get SEL
+ * Entry FFFFh): many BMCs keep Get SEL Info's timestamps frozen, and a
+ * full ring buffer keeps its entry count while new records replace the
+ * oldest, so only the newest record's bytes tell that something changed.
+ * When count, timestamps and newest record are unchanged the records are
+ * kept. When the count grew and the last known record is still there, the
+ * walk goes on from it and reads only the new records. Anything else (an
+ * erase, replaced or deleted records, a count that does not add up) reads
+ * the whole SEL again (SelReader), and so does a refresh once the verify
+ * interval has passed since the last whole read. Records are told apart
+ * by their 16 bytes, never by id or time.
  *
  * Not thread-safe: the caller holds exclusive access to the BMC.
  */
 class SelCache
 {
   public:
-    static constexpr unsigned walkAttempts = 3;
+    static constexpr unsigned walkAttempts = SelReader::walkAttempts;
+
+    /**
+     * @param eraseWait how long an erase (and a read during one) may take
+     * @param verifyEvery how often the whole SEL is read again to check
+     *        the copy; zero: never
+     */
+    explicit SelCache(
+        std::chrono::milliseconds eraseWait = SelReader::defaultEraseWait,
+        std::chrono::seconds verifyEvery = std::chrono::seconds(0)) :
+        reader_(eraseWait),
+        verifyEvery_(verifyEvery)
+    {
+    }
 
     /** Brings the copy up to date. Throws IpmiError; the copy is then
      *  unchanged, or marked for a whole read at the next refresh. */
     SelChange refresh(BmcCommands& bmc, RecordDescriber& describer);
+
+    /** Clears the SEL, waiting until the BMC has finished. */
+    void erase(BmcCommands& bmc);
 
     /** The SEL info of the last refresh. */
     const SelInfo& info() const
@@ -70,6 +89,18 @@ class SelCache
     {
         return firstNew_;
     }
+    /** Counts the refreshes that changed the records. */
+    std::uint64_t version() const
+    {
+        return version_;
+    }
+    /** Whether the SEL was seen emptied (by an erase here, or records
+     *  that all went away) and has held no record but the "log cleared"
+     *  one since. */
+    bool clearSeen() const
+    {
+        return clearSeen_;
+    }
     /** Makes the next refresh read the whole SEL. */
     void invalidate()
     {
@@ -77,17 +108,21 @@ class SelCache
     }
 
   private:
-    bool lastRecordUnchanged(BmcCommands& bmc);
+    bool unchanged(BmcCommands& bmc, const SelInfo& info);
     bool readAdded(BmcCommands& bmc, const SelInfo& info,
                    RecordDescriber& describer);
-    void readAll(BmcCommands& bmc, SelInfo info, RecordDescriber& describer);
+    bool readAll(BmcCommands& bmc, SelInfo info, RecordDescriber& describer);
     void append(const SelRecordBytes& bytes, RecordDescriber& describer);
 
+    SelReader reader_;
+    std::chrono::seconds verifyEvery_;
+    std::chrono::steady_clock::time_point lastWholeRead_;
     SelInfo info_;
     std::vector<CachedRecord> records_;
     std::size_t firstNew_ = 0;
+    std::uint64_t version_ = 0;
     bool trusted_ = false;
-    std::uint64_t sessionGeneration_ = 0;
+    bool clearSeen_ = false;
 };
 
 } // namespace QX::Ipmi

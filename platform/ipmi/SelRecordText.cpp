@@ -1,5 +1,7 @@
 #include "SelRecordText.h"
 
+#include "SelRecord.h"
+
 #include <cstdio>
 #include <ctime>
 
@@ -9,30 +11,21 @@ namespace QX::Ipmi
 namespace
 {
 
-constexpr std::uint8_t systemEventRecord = 0x02;
 constexpr std::uint8_t firstTimestampedOem = 0xC0;
 constexpr std::uint8_t lastTimestampedOem = 0xDF;
 constexpr std::uint32_t unspecifiedTimestamp = 0xFFFFFFFF;
 
-// System event record fields (IPMI 2.0, section 32.1).
-constexpr std::size_t sensorTypeByte = 10;
-constexpr std::size_t eventTypeByte = 12; // bit 7: deassertion
-constexpr std::size_t eventData1Byte = 13;
+// The "Event Logging Disabled" sensor and its offsets. The event type is
+// compared with the deassertion bit, so that only assertions count.
 constexpr std::uint8_t sensorTypeEventLoggingDisabled = 0x10;
 constexpr std::uint8_t eventTypeSensorSpecific = 0x6F;
 constexpr std::uint8_t offsetLogAreaResetCleared = 0x02;
-
-std::uint32_t rawTimestamp(const SelRecordBytes& record)
-{
-    return static_cast<std::uint32_t>(record[3]) |
-           static_cast<std::uint32_t>(record[4]) << 8 |
-           static_cast<std::uint32_t>(record[5]) << 16 |
-           static_cast<std::uint32_t>(record[6]) << 24;
-}
+constexpr std::uint8_t offsetSelFull = 0x04;
+constexpr std::uint8_t offsetSelAlmostFull = 0x05;
 
 bool hasTimestamp(std::uint8_t type)
 {
-    return type == systemEventRecord ||
+    return type == SelRecord::systemEventType ||
            (type >= firstTimestampedOem && type <= lastTimestampedOem);
 }
 
@@ -59,23 +52,17 @@ std::optional<std::int64_t> localToUtc(std::uint32_t localSeconds)
 
 std::uint16_t recordIdOf(const SelRecordBytes& record)
 {
-    return static_cast<std::uint16_t>(record[0] | record[1] << 8);
+    return SelRecord::parse(record).recordId;
 }
 
 std::uint8_t recordTypeOf(const SelRecordBytes& record)
 {
-    return record[2];
+    return SelRecord::parse(record).recordType;
 }
 
 std::string hexText(const SelRecordBytes& record)
 {
-    constexpr std::size_t size = std::tuple_size_v<SelRecordBytes>;
-    char text[size * 3 + 1];
-    for (std::size_t i = 0; i < size; ++i)
-    {
-        std::snprintf(text + 3 * i, 4, "%02x ", record[i]);
-    }
-    return std::string(text, size * 3 - 1);
+    return SelRecord::hexOf(record);
 }
 
 std::optional<std::int64_t> recordTime(const SelRecordBytes& record,
@@ -85,7 +72,7 @@ std::optional<std::int64_t> recordTime(const SelRecordBytes& record,
     {
         return std::nullopt;
     }
-    const std::uint32_t raw = rawTimestamp(record);
+    const std::uint32_t raw = SelRecord::parse(record).timestamp;
     if (raw <= lastPreInitTimestamp || raw == unspecifiedTimestamp)
     {
         return std::nullopt;
@@ -117,10 +104,31 @@ std::string timestampText(const SelRecordBytes& record, SelClock clock)
 
 bool isLogClearedRecord(const SelRecordBytes& record)
 {
-    return recordTypeOf(record) == systemEventRecord &&
-           record[sensorTypeByte] == sensorTypeEventLoggingDisabled &&
-           record[eventTypeByte] == eventTypeSensorSpecific &&
-           (record[eventData1Byte] & 0x0F) == offsetLogAreaResetCleared;
+    const SelRecord fields = SelRecord::parse(record);
+    return fields.isSystemEvent() &&
+           fields.sensorType == sensorTypeEventLoggingDisabled &&
+           fields.eventDirType == eventTypeSensorSpecific &&
+           fields.offset() == offsetLogAreaResetCleared;
+}
+
+FillEvent fillEventOf(const SelRecordBytes& record)
+{
+    const SelRecord fields = SelRecord::parse(record);
+    if (!fields.isSystemEvent() ||
+        fields.sensorType != sensorTypeEventLoggingDisabled ||
+        fields.eventDirType != eventTypeSensorSpecific)
+    {
+        return FillEvent::None;
+    }
+    switch (fields.offset())
+    {
+        case offsetSelFull:
+            return FillEvent::Full;
+        case offsetSelAlmostFull:
+            return FillEvent::AlmostFull;
+        default:
+            return FillEvent::None;
+    }
 }
 
 std::string fallbackDescription(const SelRecordBytes& record)

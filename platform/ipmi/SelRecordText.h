@@ -49,6 +49,15 @@ std::string timestampText(const SelRecordBytes& record, SelClock clock);
  *  Reset/Cleared" assertion that many BMCs write right after a clear. */
 bool isLogClearedRecord(const SelRecordBytes& record);
 
+/** What an "Event Logging Disabled" record says about the SEL's fill. */
+enum class FillEvent
+{
+    None,       // not a fill record (or a deassertion)
+    AlmostFull, // "SEL almost full" asserted (offset 05h)
+    Full,       // "SEL full" asserted (offset 04h)
+};
+FillEvent fillEventOf(const SelRecordBytes& record);
+
 /** A readable description from the bytes alone, for records FreeIPMI
  *  cannot interpret: "SEL record type 30h: 01 02 ...". Never empty. */
 std::string fallbackDescription(const SelRecordBytes& record);

@@ -8,6 +8,7 @@
 #include "ipmi/BmcCommands.h"
 #include "ipmi/IpmiError.h"
 #include "ipmi/RecordDescriber.h"
+#include "ipmi/SelRecord.h"
 
 #include <algorithm>
 #include <cstdint>
@@ -32,13 +33,9 @@ inline Ipmi::SelRecordBytes selRecord(std::uint16_t id,
 /** The "Log Area Reset/Cleared" record BMCs write after a clear. */
 inline Ipmi::SelRecordBytes logClearedRecord(std::uint16_t id)
 {
-    Ipmi::SelRecordBytes record = selRecord(id, 0x65e5831a, 0x10);
-    record[11] = 0x01;
-    record[12] = 0x6f;
-    record[13] = 0x02;
-    record[14] = 0xff;
-    record[15] = 0xff;
-    return record;
+    return Ipmi::SelRecord::systemEvent(id, 0x65e5831a, 0x10, 0x01, 0x6f,
+                                        {0x02, 0xff, 0xff})
+        .bytes();
 }
 
 class FakeBmc : public Ipmi::BmcCommands
@@ -114,14 +111,19 @@ class FakeBmc : public Ipmi::BmcCommands
                                 ? std::nullopt
                                 : std::optional<unsigned>(*cancelAtEntry - 1);
         }
-        if (cancelNow || reservationId != reservation_)
+        // Reservation 0 reads whole records without one.
+        if (cancelNow || (reservationId != 0 && reservationId != reservation_))
         {
             throw Ipmi::IpmiError(
                 "ipmi_cmd_get_sel_entry", Ipmi::ErrorCategory::CompletionCode,
                 "reservation cancelled", Ipmi::completionReservationCancelled);
         }
         auto found = sel.begin();
-        if (recordId != Ipmi::firstRecordId)
+        if (recordId == Ipmi::lastRecordId)
+        {
+            found = sel.empty() ? sel.end() : sel.end() - 1;
+        }
+        else if (recordId != Ipmi::firstRecordId)
         {
             found = std::find_if(sel.begin(), sel.end(),
                                  [recordId](const Ipmi::SelRecordBytes& r)

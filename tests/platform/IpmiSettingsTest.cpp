@@ -187,4 +187,21 @@ TEST_F(IpmiSettingsTest, InterfaceAndHostMustAgree)
                 HasSubstr("ipmi.retransmission-timeout must be below"));
 }
 
+TEST_F(IpmiSettingsTest, ClearWaitAndVerifyInterval)
+{
+    const Ipmi::Settings defaults;
+    EXPECT_EQ(defaults.clearWaitMs, 30000u);
+    EXPECT_EQ(defaults.selVerifySeconds, 3600u);
+    const auto configuration =
+        Platform::parseConfiguration("ipmi.clear-wait = 90000\n"
+                                     "ipmi.sel-verify-interval = 0\n",
+                                     "platform.conf");
+    EXPECT_EQ(configuration.ipmi.clearWaitMs, 90000u);
+    EXPECT_EQ(configuration.ipmi.selVerifySeconds, 0u);
+    EXPECT_THAT(configurationError("ipmi.clear-wait = 10\n"),
+                HasSubstr("ipmi.clear-wait must be a whole number from 1000"));
+    EXPECT_THAT(configurationError("ipmi.sel-verify-interval = hourly\n"),
+                HasSubstr("ipmi.sel-verify-interval must be a whole number"));
+}
+
 } // namespace
