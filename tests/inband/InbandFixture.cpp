@@ -2,6 +2,7 @@
 
 #include "CVLogger.h"
 #include "Platform.h"
+#include "SelRequests.h"
 #include "SystemEventRecord.h"
 #include "ipmi/ExchangeWorker.h"
 #include "ipmi/FreeIpmiHandles.h"
@@ -108,21 +109,12 @@ std::uint16_t InbandTest::addThroughDriver(const inbandsim::Record& record)
 
 host::Outcome InbandTest::enumerate(const std::string& className)
 {
-    host::ObjectPath path;
-    path.nameSpace = "root/zanqx";
-    path.className = className;
-    return host_->enumerateInstances(path);
+    return testrequests::enumerate(*host_, className);
 }
 
 host::Outcome InbandTest::clearLog()
 {
-    host::ObjectPath path;
-    path.nameSpace = "root/zanqx";
-    path.className = "ZAN_MgmtHwLog";
-    path.keys.edit().push_back({"Name", host::Value::string("IPMI SEL Log")});
-    path.keys.edit().push_back(
-        {"CreationClassName", host::Value::string("ZAN_MgmtHwLog")});
-    return host_->invokeMethod(path, "ClearLog");
+    return testrequests::clearLog(*host_);
 }
 
 inbandsim::Record temperatureRecord(std::uint8_t reading)

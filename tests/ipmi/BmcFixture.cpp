@@ -2,6 +2,7 @@
 
 #include "CVLogger.h"
 #include "Platform.h"
+#include "SelRequests.h"
 #include "ipmi/IpmiSourceFactory.h"
 
 #include <cstdio>
@@ -69,21 +70,12 @@ void BmcTest::startProvider(unsigned timeoutMs)
 
 host::Outcome BmcTest::enumerate(const std::string& className)
 {
-    host::ObjectPath path;
-    path.nameSpace = "root/zanqx";
-    path.className = className;
-    return host_->enumerateInstances(path);
+    return testrequests::enumerate(*host_, className);
 }
 
 host::Outcome BmcTest::clearLog()
 {
-    host::ObjectPath path;
-    path.nameSpace = "root/zanqx";
-    path.className = "ZAN_MgmtHwLog";
-    path.keys.edit().push_back({"Name", host::Value::string("IPMI SEL Log")});
-    path.keys.edit().push_back(
-        {"CreationClassName", host::Value::string("ZAN_MgmtHwLog")});
-    return host_->invokeMethod(path, "ClearLog");
+    return testrequests::clearLog(*host_);
 }
 
 std::string BmcTest::ipmitool(const std::string& arguments) const

@@ -35,15 +35,6 @@ class AlertingProfilesTest : public ProfileTest
     }
 };
 
-BmcProfile frozenRing(std::size_t size)
-{
-    BmcProfile profile;
-    profile.capacity = size;
-    profile.ringBuffer = true;
-    profile.frozenTimestamps = true;
-    return profile;
-}
-
 } // namespace
 
 TEST_F(AlertingProfilesTest, FrozenRingBufferAnnouncesEveryNewRecord)

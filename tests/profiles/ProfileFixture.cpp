@@ -2,6 +2,7 @@
 
 #include "CVLogger.h"
 #include "Platform.h"
+#include "SelRequests.h"
 #include "ipmi/SelRecord.h"
 
 #include <algorithm>
@@ -94,21 +95,12 @@ std::vector<host::DeliveredIndication> ProfileTest::settle()
 
 host::Outcome ProfileTest::enumerate(const std::string& className)
 {
-    host::ObjectPath path;
-    path.nameSpace = "root/zanqx";
-    path.className = className;
-    return host_->enumerateInstances(path);
+    return testrequests::enumerate(*host_, className);
 }
 
 host::Outcome ProfileTest::clearLog()
 {
-    host::ObjectPath path;
-    path.nameSpace = "root/zanqx";
-    path.className = "ZAN_MgmtHwLog";
-    path.keys.edit().push_back({"Name", host::Value::string("IPMI SEL Log")});
-    path.keys.edit().push_back(
-        {"CreationClassName", host::Value::string("ZAN_MgmtHwLog")});
-    return host_->invokeMethod(path, "ClearLog");
+    return testrequests::clearLog(*host_);
 }
 
 void ProfileTest::expectEnumerationIsTheSel()

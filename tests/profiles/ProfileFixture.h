@@ -26,6 +26,16 @@ using namespace testevents;
 /** How long a test waits for something that normally takes milliseconds. */
 constexpr std::chrono::seconds patience{10};
 
+/** A ring buffer of @p size records whose Get SEL Info times never move. */
+inline QX::test::BmcProfile frozenRing(std::size_t size)
+{
+    QX::test::BmcProfile profile;
+    profile.capacity = size;
+    profile.ringBuffer = true;
+    profile.frozenTimestamps = true;
+    return profile;
+}
+
 class ProfileTest : public ::testing::Test
 {
   protected:

@@ -18,15 +18,6 @@ class ReadingProfilesTest : public ProfileTest
 {
 };
 
-BmcProfile frozenRing(std::size_t size)
-{
-    BmcProfile profile;
-    profile.capacity = size;
-    profile.ringBuffer = true;
-    profile.frozenTimestamps = true;
-    return profile;
-}
-
 } // namespace
 
 TEST_F(ReadingProfilesTest, FrozenRingBufferShowsReplacedRecords)
