@@ -62,11 +62,12 @@ IpmiSession::IpmiSession(SessionParameters parameters,
                          CipherSuiteChoice cipherSuites) :
     parameters_(std::move(parameters)),
     cipherSuites_(std::move(cipherSuites)),
-    reopenAfter_(parameters_.lan ? std::min<std::chrono::milliseconds>(
-                                       std::chrono::milliseconds(
-                                           parameters_.sessionTimeoutMs / 2),
-                                       std::chrono::seconds(15))
-                                 : std::chrono::milliseconds::max()),
+    reopenAfter_(
+        parameters_.lan
+            ? std::optional(std::min<std::chrono::milliseconds>(
+                  std::chrono::milliseconds(parameters_.sessionTimeoutMs / 2),
+                  std::chrono::seconds(15)))
+            : std::nullopt),
     guarded_(!parameters_.lan || parameters_.guardExchanges)
 {
     if (parameters_.lan)
@@ -123,7 +124,7 @@ std::shared_ptr<IpmiContext> IpmiSession::open()
     {
         const Clock::time_point last{
             std::chrono::nanoseconds(lastActivity_.load())};
-        if (Clock::now() - last < reopenAfter_)
+        if (!reopenAfter_ || Clock::now() - last < *reopenAfter_)
         {
             return context_;
         }

@@ -100,7 +100,9 @@ class IpmiSession : public BmcCommands
 
     SessionParameters parameters_;
     CipherSuiteChoice cipherSuites_;
-    std::chrono::milliseconds reopenAfter_;
+    /** Idle time after which a LAN session is replaced; none in-band,
+     *  where there is no session to lose. */
+    std::optional<std::chrono::milliseconds> reopenAfter_;
     bool guarded_;
     std::shared_ptr<IpmiContext> context_;
     bool lost_ = false; // the last session ended in a failure
