@@ -37,6 +37,8 @@ SelChange SelCache::refresh(BmcCommands& bmc, RecordDescriber& describer)
             throw;
         }
     }
+    // Loaded after the sensor names, so that its texts have them.
+    useKept(describer);
     const bool verifyDue =
         verifyEvery_.count() > 0 &&
         std::chrono::steady_clock::now() - lastWholeRead_ >= verifyEvery_;
@@ -66,6 +68,14 @@ SelChange SelCache::refresh(BmcCommands& bmc, RecordDescriber& describer)
                                                : SelChange::None;
     }
 
+    if (keptUnshown_)
+    {
+        // Every record of a loaded copy is new to whoever shows it, also
+        // when the refresh that loaded it failed half-way.
+        keptUnshown_ = false;
+        firstNew_ = 0;
+        change = SelChange::Replaced;
+    }
     if (namesChanged && change != SelChange::Replaced)
     {
         for (CachedRecord& record : records_)
@@ -79,6 +89,50 @@ SelChange SelCache::refresh(BmcCommands& bmc, RecordDescriber& describer)
         ++version_;
     }
     return change;
+}
+
+bool SelCache::useKept(RecordDescriber& describer)
+{
+    if (!kept_)
+    {
+        return false;
+    }
+    KeptSel kept = std::move(*kept_);
+    kept_.reset();
+    if (trusted_ || !records_.empty() ||
+        lastWholeRead_ != std::chrono::steady_clock::time_point{})
+    {
+        return false; // this process has read the SEL itself
+    }
+    for (const SelRecordBytes& bytes : kept.records)
+    {
+        append(bytes, describer);
+    }
+    info_ = kept.info;
+    clearSeen_ = kept.clearSeen;
+    // From here on the kept copy is checked as a copy read by this
+    // process: the refresh that loaded it compares it with the BMC.
+    trusted_ = true;
+    keptUnshown_ = true;
+    lastWholeRead_ = std::chrono::steady_clock::now();
+    return true;
+}
+
+std::optional<KeptSel> SelCache::keep() const
+{
+    if (!trusted_)
+    {
+        return std::nullopt;
+    }
+    KeptSel kept;
+    kept.info = info_;
+    kept.clearSeen = clearSeen_;
+    kept.records.reserve(records_.size());
+    for (const CachedRecord& record : records_)
+    {
+        kept.records.push_back(record.bytes);
+    }
+    return kept;
 }
 
 void SelCache::erase(BmcCommands& bmc)
