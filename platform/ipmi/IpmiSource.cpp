@@ -154,7 +154,7 @@ void IpmiSource::keepCopy()
         return;
     }
     copyStamp_ = stamp;
-    std::optional<KeptSel> copy = cache_.keep();
+    std::optional<KeptSel> copy = cache_.keep(describer_->textsKey());
     if (!copy)
     {
         return; // not known to be true: the file keeps what it had

@@ -104,9 +104,22 @@ bool SelCache::useKept(RecordDescriber& describer)
     {
         return false; // this process has read the SEL itself
     }
-    for (const SelRecordBytes& bytes : kept.records)
+    // Texts made under the same names are used as they are; describing
+    // every record is most of what loading a large copy costs.
+    const std::string textsKey = describer.textsKey();
+    const bool textsFit = !textsKey.empty() && kept.textsKey == textsKey &&
+                          kept.texts.size() == kept.records.size();
+    records_.reserve(kept.records.size());
+    for (std::size_t i = 0; i < kept.records.size(); ++i)
     {
-        append(bytes, describer);
+        if (textsFit)
+        {
+            append(kept.records[i], std::move(kept.texts[i]));
+        }
+        else
+        {
+            append(kept.records[i], describer);
+        }
     }
     info_ = kept.info;
     clearSeen_ = kept.clearSeen;
@@ -118,7 +131,7 @@ bool SelCache::useKept(RecordDescriber& describer)
     return true;
 }
 
-std::optional<KeptSel> SelCache::keep() const
+std::optional<KeptSel> SelCache::keep(const std::string& textsKey) const
 {
     if (!trusted_)
     {
@@ -131,6 +144,15 @@ std::optional<KeptSel> SelCache::keep() const
     for (const CachedRecord& record : records_)
     {
         kept.records.push_back(record.bytes);
+    }
+    if (!textsKey.empty())
+    {
+        kept.textsKey = textsKey;
+        kept.texts.reserve(records_.size());
+        for (const CachedRecord& record : records_)
+        {
+            kept.texts.push_back(record.description);
+        }
     }
     return kept;
 }
@@ -254,6 +276,21 @@ bool SelCache::readAll(BmcCommands& bmc, SelInfo info,
 
 void SelCache::append(const SelRecordBytes& bytes, RecordDescriber& describer)
 {
+    std::string description;
+    try
+    {
+        description = describer.describe(bytes);
+    }
+    catch (const std::exception&)
+    {
+        // A record nothing can interpret keeps its bytes and a plain text.
+        description = fallbackDescription(bytes);
+    }
+    append(bytes, std::move(description));
+}
+
+void SelCache::append(const SelRecordBytes& bytes, std::string description)
+{
     CachedRecord record;
     record.id = recordIdOf(bytes);
     record.bytes = bytes;
@@ -262,15 +299,7 @@ void SelCache::append(const SelRecordBytes& bytes, RecordDescriber& describer)
         const CachedRecord& previous = records_.back();
         record.run = previous.run + (record.id <= previous.id ? 1 : 0);
     }
-    try
-    {
-        record.description = describer.describe(bytes);
-    }
-    catch (const std::exception&)
-    {
-        // A record nothing can interpret keeps its bytes and a plain text.
-        record.description = fallbackDescription(bytes);
-    }
+    record.description = std::move(description);
     records_.push_back(std::move(record));
 }
 

@@ -87,9 +87,11 @@ class SelCache
     {
         kept_ = std::move(kept);
     }
-    /** The copy to keep for a later process: nothing while the copy is
-     *  not known to match the SEL (to be read again next time). */
-    std::optional<KeptSel> keep() const;
+    /** The copy to keep for a later process, its texts under
+     *  @p textsKey (RecordDescriber::textsKey; empty: none): nothing while
+     *  the copy is not known to match the SEL (to be read again next
+     *  time). */
+    std::optional<KeptSel> keep(const std::string& textsKey) const;
 
     /** Clears the SEL, waiting until the BMC has finished. */
     void erase(BmcCommands& bmc);
@@ -133,6 +135,7 @@ class SelCache
                    RecordDescriber& describer);
     bool readAll(BmcCommands& bmc, SelInfo info, RecordDescriber& describer);
     void append(const SelRecordBytes& bytes, RecordDescriber& describer);
+    void append(const SelRecordBytes& bytes, std::string description);
 
     SelReader reader_;
     std::chrono::seconds verifyEvery_;

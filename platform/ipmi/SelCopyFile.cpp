@@ -22,10 +22,13 @@ namespace QX::Ipmi
 //                         bit 2 clear seen; other bits zero
 //   count        u32      records that follow, at most maxKeptRecords
 //   records      count x 16 bytes, in SEL order
+//   texts key    u16 length (at most maxTextsKey) and bytes
+//   text count   u32      0, or count: one text per record
+//   texts        each u16 length (at most maxKeptText) and bytes
 //   checksum     u64      FNV-1a over every byte before it
 //
-// A reader takes the file only when every field is in range, the length
-// is exactly what the count says and the checksum matches; anything else
+// A reader takes the file only when every field is in range, the file
+// ends right after the checksum and the checksum matches; anything else
 // (truncated, padded, bit flips, another version, another BMC) is no
 // copy at all, so the caller reads the whole SEL instead.
 
@@ -39,9 +42,18 @@ constexpr std::uint8_t flagClearSeen = 0x04;
 constexpr std::uint8_t knownFlags = flagOverflow | flagReserve | flagClearSeen;
 constexpr std::size_t recordSize = std::tuple_size_v<SelRecordBytes>;
 constexpr std::size_t checksumSize = 8;
-// Everything but the key and the records.
+// Everything but the keys, the records and the texts.
 constexpr std::size_t fixedSize =
-    magic.size() + 4 + 2 + 2 + 2 + 4 + 4 + 1 + 4 + checksumSize;
+    magic.size() + 4 + 2 + 2 + 2 + 4 + 4 + 1 + 4 + 2 + 4 + checksumSize;
+
+bool textsFit(const KeptSel& copy)
+{
+    return copy.texts.size() == copy.records.size() &&
+           copy.textsKey.size() <= maxTextsKey &&
+           std::all_of(copy.texts.begin(), copy.texts.end(),
+                       [](const std::string& text)
+                       { return text.size() <= maxKeptText; });
+}
 
 std::uint64_t fnv1a(std::string_view bytes)
 {
@@ -134,6 +146,21 @@ std::string formatSelCopy(const KeptSel& copy)
     {
         out.append(reinterpret_cast<const char*>(record.data()), record.size());
     }
+    // Texts that do not fit are not kept: the reader makes them again.
+    const bool texts = !copy.textsKey.empty() && textsFit(copy);
+    const std::string_view textsKey =
+        texts ? std::string_view(copy.textsKey) : std::string_view();
+    put(out, textsKey.size(), 2);
+    out += textsKey;
+    put(out, texts ? copy.texts.size() : 0, 4);
+    if (texts)
+    {
+        for (const std::string& text : copy.texts)
+        {
+            put(out, text.size(), 2);
+            out += text;
+        }
+    }
     put(out, fnv1a(out), checksumSize);
     return out;
 }
@@ -193,15 +220,20 @@ std::optional<KeptSel> parseSelCopy(std::string_view bytes,
         problem = "the file is truncated";
         return std::nullopt;
     }
-    if (count > maxKeptRecords ||
-        bytes.size() != cursor.at() + count * recordSize + checksumSize)
+    if (cursor.at() > body.size())
     {
-        problem = "the length does not match the record count";
+        problem = "the file is truncated";
         return std::nullopt;
     }
     if (fnv1a(body) != checksum)
     {
         problem = "the checksum does not match";
+        return std::nullopt;
+    }
+    if (count > maxKeptRecords ||
+        (body.size() - cursor.at()) / recordSize < count)
+    {
+        problem = "the length does not match the record count";
         return std::nullopt;
     }
     if ((flags & ~std::uint64_t{knownFlags}) != 0)
@@ -230,6 +262,37 @@ std::optional<KeptSel> parseSelCopy(std::string_view bytes,
         std::transform(raw.begin(), raw.end(), record.begin(),
                        [](char c) { return static_cast<std::uint8_t>(c); });
     }
+
+    // The texts: within the body, every length checked before it is used.
+    Cursor rest(body.substr(cursor.at()));
+    std::uint64_t textsKeySize = 0;
+    std::string_view textsKey;
+    std::uint64_t textCount = 0;
+    if (!rest.take(2, textsKeySize) || textsKeySize > maxTextsKey ||
+        !rest.take(textsKeySize, textsKey) || !rest.take(4, textCount) ||
+        (textCount != 0 && textCount != count))
+    {
+        problem = "the texts are malformed";
+        return std::nullopt;
+    }
+    copy.texts.reserve(textCount);
+    for (std::uint64_t i = 0; i < textCount; ++i)
+    {
+        std::uint64_t size = 0;
+        std::string_view text;
+        if (!rest.take(2, size) || size > maxKeptText || !rest.take(size, text))
+        {
+            problem = "the texts are malformed";
+            return std::nullopt;
+        }
+        copy.texts.emplace_back(text);
+    }
+    if (rest.at() != body.size() - cursor.at())
+    {
+        problem = "the length does not match the contents";
+        return std::nullopt;
+    }
+    copy.textsKey = textCount != 0 ? std::string(textsKey) : std::string();
     return copy;
 }
 
@@ -237,8 +300,8 @@ std::optional<KeptSel> readSelCopy(const std::string& path,
                                    const std::string& bmcKey,
                                    std::string& problem)
 {
-    const std::size_t limit =
-        fixedSize + maxBmcKey + maxKeptRecords * recordSize;
+    const std::size_t limit = fixedSize + maxBmcKey + maxTextsKey +
+                              maxKeptRecords * (recordSize + 2 + maxKeptText);
     const std::optional<std::string> bytes =
         readSmallFile(path, limit, problem);
     if (!bytes)

@@ -15,8 +15,9 @@ namespace QX::Ipmi
  * @brief The SEL copy as kept on disk between processes: the record bytes
  *        and what change detection compares them with, for one BMC.
  *
- * Event texts are not kept: they are made again from the bytes when the
- * copy is loaded, with the sensor names of that process.
+ * The event texts are kept with the key of what they depend on besides
+ * the bytes (RecordDescriber::textsKey): a process whose describer gives
+ * the same key uses them as they are, any other makes them again.
  */
 struct KeptSel
 {
@@ -27,6 +28,10 @@ struct KeptSel
     /** The SEL was seen emptied and holds nothing newer (SelCache). */
     bool clearSeen = false;
     std::vector<SelRecordBytes> records;
+    /** RecordDescriber::textsKey of the texts; empty: no texts kept. */
+    std::string textsKey;
+    /** One text per record, or none. */
+    std::vector<std::string> texts;
 
     bool operator==(const KeptSel&) const = default;
 };
@@ -39,11 +44,15 @@ struct SelCopyPlace
 };
 
 /** The format version written; a file of another version is not used. */
-constexpr std::uint32_t selCopyVersion = 1;
+constexpr std::uint32_t selCopyVersion = 2;
 /** The most records a SEL can hold (16-bit ids, FFFFh reserved). */
 constexpr std::size_t maxKeptRecords = 65535;
 /** The longest BMC key kept. */
 constexpr std::size_t maxBmcKey = 255;
+/** The longest texts key and the longest text kept; a copy with a longer
+ *  text keeps no texts. */
+constexpr std::size_t maxTextsKey = 1024;
+constexpr std::size_t maxKeptText = 1024;
 
 /** The file's bytes for @p copy. Throws std::invalid_argument when the
  *  copy exceeds the bounds above. */

@@ -85,6 +85,28 @@ TEST_F(SelCopyFileTest, FormatsAndParsesBackEveryField)
     EXPECT_EQ(parse(formatSelCopy(plain)), plain);
 }
 
+TEST_F(SelCopyFileTest, TextsAreKeptWithTheirKey)
+{
+    KeptSel copy = sample(3);
+    copy.textsKey = "names 1";
+    copy.texts = {"first", "", std::string(maxKeptText, 'x')};
+    std::optional<KeptSel> back = parse(formatSelCopy(copy));
+    ASSERT_TRUE(back) << problem;
+    EXPECT_EQ(*back, copy);
+
+    // A text too long, or texts that do not match the records: none kept.
+    copy.texts[1] = std::string(maxKeptText + 1, 'y');
+    back = parse(formatSelCopy(copy));
+    ASSERT_TRUE(back) << problem;
+    EXPECT_TRUE(back->texts.empty());
+    EXPECT_TRUE(back->textsKey.empty());
+    EXPECT_EQ(back->records, copy.records);
+    copy.texts.pop_back();
+    back = parse(formatSelCopy(copy));
+    ASSERT_TRUE(back) << problem;
+    EXPECT_TRUE(back->texts.empty());
+}
+
 TEST_F(SelCopyFileTest, SizeIsBoundedBySixteenBytesPerRecord)
 {
     const std::string bytes = formatSelCopy(sample(100));
@@ -99,7 +121,10 @@ TEST_F(SelCopyFileTest, SizeIsBoundedBySixteenBytesPerRecord)
 
 TEST_F(SelCopyFileTest, EveryTruncationIsRefused)
 {
-    const std::string bytes = formatSelCopy(sample(4));
+    KeptSel copy = sample(4);
+    copy.textsKey = "k";
+    copy.texts = {"a", "bb", "ccc", ""};
+    const std::string bytes = formatSelCopy(copy);
     for (std::size_t length = 0; length < bytes.size(); ++length)
     {
         EXPECT_FALSE(parse(bytes.substr(0, length))) << "length " << length;
@@ -110,7 +135,10 @@ TEST_F(SelCopyFileTest, EveryTruncationIsRefused)
 
 TEST_F(SelCopyFileTest, EveryFlippedBitIsRefused)
 {
-    const std::string bytes = formatSelCopy(sample(3));
+    KeptSel copy = sample(3);
+    copy.textsKey = "k";
+    copy.texts = {"a", "bb", "ccc"};
+    const std::string bytes = formatSelCopy(copy);
     for (std::size_t at = 0; at < bytes.size(); ++at)
     {
         for (int bit = 0; bit < 8; ++bit)
@@ -175,8 +203,9 @@ TEST_F(SelCopyFileTest, MissingOrOverlongFileIsNoCopy)
     {
         std::ofstream file(path, std::ios::binary);
         file << formatSelCopy(sample(1));
-        file << std::string(std::size_t{2} * 1024 * 1024, 'x');
     }
+    // Longer than the largest copy with the longest texts (sparse).
+    std::filesystem::resize_file(path, std::uintmax_t{80} << 20);
     EXPECT_FALSE(readSelCopy(path, "lan-bmc1", problem));
     EXPECT_THAT(problem, HasSubstr("too long"));
 }

@@ -46,6 +46,7 @@ void ProfileTest::load()
 {
     auto ownedDescriber = std::make_unique<QX::test::ProfileDescriber>();
     describer = ownedDescriber.get();
+    describer->key = textsKey;
     QX::Ipmi::Settings settings;
     settings.timeoutMs = timeoutMs_;
     settings.pollIntervalMs = pollMs;

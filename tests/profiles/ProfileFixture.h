@@ -92,6 +92,8 @@ class ProfileTest : public ::testing::Test
     /** State files kept across restart(); empty: none. */
     std::string alertStateFile;
     QX::Ipmi::SelCopyPlace selCopy;
+    /** The describer's texts key in the next load. */
+    std::string textsKey;
 };
 
 /** Text property of an instance, "" when absent. */

@@ -320,3 +320,27 @@ TEST_F(RestartProfilesTest, PollerAnnouncesAClearMeanwhile)
     expectEntryEvents(later, added(before, bmc->truth()));
     EXPECT_EQ(later.size(), 2u);
 }
+
+TEST_F(RestartProfilesTest, TextsAreKeptUnderTheSameNames)
+{
+    textsKey = "names-1";
+    start(BmcProfile{});
+    addRecords(40);
+    readOnce();
+    restart();
+    expectEnumerationIsTheSel();
+    EXPECT_EQ(describer->described, 0u);
+    const auto entries = enumerate("ZAN_MgmtHwLogEntry");
+    ASSERT_EQ(entries.instances.size(), 40u);
+    EXPECT_EQ(text(entries.instances[4], "Description"), "event 5");
+    // Other sensor names: every text is made again.
+    textsKey = "names-2";
+    restart();
+    expectEnumerationIsTheSel();
+    EXPECT_EQ(describer->described, 40u);
+    // No key: texts are not reused.
+    textsKey.clear();
+    restart();
+    expectEnumerationIsTheSel();
+    EXPECT_EQ(describer->described, 40u);
+}

@@ -220,9 +220,17 @@ class ProfileDescriber : public Ipmi::RecordDescriber
   public:
     std::atomic<bool> sdrTimesOut{false};
     std::uint8_t unreadableType = 0x55;
+    /** What textsKey() gives; empty: texts are never reused. */
+    std::string key;
+    /** Records described so far. */
+    std::atomic<unsigned> described{0};
 
     bool refreshSensorNames() override;
     std::string describe(const Ipmi::SelRecordBytes& record) override;
+    std::string textsKey() const override
+    {
+        return key;
+    }
 };
 
 } // namespace QX::test
