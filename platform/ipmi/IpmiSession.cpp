@@ -58,8 +58,10 @@ FiidObject clearSel(IpmiContext& context, std::uint16_t reservationId,
 
 } // namespace
 
-IpmiSession::IpmiSession(SessionParameters parameters) :
+IpmiSession::IpmiSession(SessionParameters parameters,
+                         CipherSuiteChoice cipherSuites) :
     parameters_(std::move(parameters)),
+    cipherSuites_(std::move(cipherSuites)),
     reopenAfter_(parameters_.lan ? std::min<std::chrono::milliseconds>(
                                        std::chrono::milliseconds(
                                            parameters_.sessionTimeoutMs / 2),
@@ -67,6 +69,10 @@ IpmiSession::IpmiSession(SessionParameters parameters) :
                                  : std::chrono::milliseconds::max()),
     guarded_(!parameters_.lan || parameters_.guardExchanges)
 {
+    if (parameters_.lan)
+    {
+        cipherSuites_.rememberFor(peerKey());
+    }
 }
 
 IpmiSession::~IpmiSession() = default;
@@ -127,7 +133,8 @@ std::shared_ptr<IpmiContext> IpmiSession::open()
     }
     try
     {
-        context_ = std::make_shared<IpmiContext>(parameters_);
+        context_ = parameters_.lan ? openLan()
+                                   : std::make_shared<IpmiContext>(parameters_);
     }
     catch (const IpmiError&)
     {
@@ -148,6 +155,45 @@ std::shared_ptr<IpmiContext> IpmiSession::open()
     }
     lost_ = false;
     return context_;
+}
+
+std::shared_ptr<IpmiContext> IpmiSession::openLan()
+{
+    const std::vector<std::uint8_t> suites = cipherSuites_.candidates();
+    if (suites.empty())
+    {
+        return std::make_shared<IpmiContext>(parameters_);
+    }
+    SessionParameters attempt = parameters_;
+    for (std::size_t i = 0;; ++i)
+    {
+        attempt.cipherSuite = suites[i];
+        cipherSuites_.tried();
+        try
+        {
+            auto context = std::make_shared<IpmiContext>(attempt);
+            if (i > 0)
+            {
+                logLine(logLevelInfo, "IpmiSession::openLan", __LINE__,
+                        "IPMI session opened with cipher suite " +
+                            std::to_string(suites[i]) + " after suite " +
+                            std::to_string(suites[0]) +
+                            " was refused: " + peerName());
+            }
+            cipherSuites_.worked(suites[i]);
+            return context;
+        }
+        catch (const IpmiError& error)
+        {
+            // A BMC that does not answer is not asked again with another
+            // suite: that would only double the wait.
+            if (i + 1 == suites.size() ||
+                error.category() == ErrorCategory::Timeout)
+            {
+                throw;
+            }
+        }
+    }
 }
 
 void IpmiSession::touch()

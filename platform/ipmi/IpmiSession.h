@@ -1,6 +1,7 @@
 #pragma once
 
 #include "BmcCommands.h"
+#include "CipherSuiteChoice.h"
 #include "ExchangeWorker.h"
 #include "FreeIpmiHandles.h"
 
@@ -44,7 +45,10 @@ namespace QX::Ipmi
 class IpmiSession : public BmcCommands
 {
   public:
-    explicit IpmiSession(SessionParameters parameters);
+    /** @p cipherSuites picks the suite of each LAN session; by default
+     *  the one in @p parameters. */
+    explicit IpmiSession(SessionParameters parameters,
+                         CipherSuiteChoice cipherSuites = {});
     /** Joins the in-band worker (defined here, where the worker is known:
      *  the worker is not part of the library's interface). */
     ~IpmiSession() override;
@@ -71,6 +75,12 @@ class IpmiSession : public BmcCommands
      */
     void run(const std::function<void(IpmiContext&)>& work);
 
+    /** How LAN sessions pick their cipher suite, and how they did. */
+    const CipherSuiteChoice& cipherSuites() const
+    {
+        return cipherSuites_;
+    }
+
     /** "LAN 2.0 host:port" or "in-band (KCS)", for log lines. */
     std::string peerName() const;
     /** A name for files kept per BMC: "lan-host_port" or "inband". */
@@ -78,6 +88,8 @@ class IpmiSession : public BmcCommands
 
   private:
     std::shared_ptr<IpmiContext> open();
+    /** A new LAN session, trying the cipher suites in turn. */
+    std::shared_ptr<IpmiContext> openLan();
     template <typename Result, typename Work>
     Result exchange(Work work);
     template <typename Result, typename Work>
@@ -87,6 +99,7 @@ class IpmiSession : public BmcCommands
     void noteFailure(const IpmiError& error);
 
     SessionParameters parameters_;
+    CipherSuiteChoice cipherSuites_;
     std::chrono::milliseconds reopenAfter_;
     bool guarded_;
     std::shared_ptr<IpmiContext> context_;

@@ -210,7 +210,21 @@ std::string applySetting(Settings& settings, const std::string& key,
     }
     else if (key == "ipmi.cipher-suite")
     {
-        return number(key, value, 0, 17, settings.cipherSuite);
+        if (value == "auto")
+        {
+            settings.cipherSuite.reset();
+            return {};
+        }
+        unsigned suite = 0;
+        if (!parseUnsigned(value, 0, 17, suite))
+        {
+            return key +
+                   " must be auto or a whole number from 0 to 17, "
+                   "not \"" +
+                   value + "\"";
+        }
+        settings.cipherSuite = suite;
+        return {};
     }
     else if (key == "ipmi.workarounds")
     {

@@ -2,6 +2,7 @@
 
 #include "SelRecordText.h"
 
+#include <optional>
 #include <string>
 #include <vector>
 
@@ -33,7 +34,9 @@ struct Settings
     bool passwordInConfiguration = false;
     std::string passwordFile;
     std::string privilege = "operator"; // user, operator or admin
-    unsigned cipherSuite = 3;
+    // LAN: a fixed RMCP+ cipher suite; empty ("auto") tries 17, then 3,
+    // and remembers per BMC the one that worked.
+    std::optional<unsigned> cipherSuite;
     std::vector<std::string> workarounds; // FreeIPMI's workaround names
     unsigned timeoutMs = 5000;
     unsigned retransmissionTimeoutMs = 1000;

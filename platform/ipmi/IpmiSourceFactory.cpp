@@ -94,11 +94,24 @@ SessionParameters sessionParameters(const Settings& settings, Workaround& all)
     parameters.user = settings.user;
     parameters.password = settings.password;
     parameters.privilege = privilegeLevel(settings.privilege);
-    parameters.cipherSuite = static_cast<std::uint8_t>(settings.cipherSuite);
+    parameters.cipherSuite =
+        static_cast<std::uint8_t>(settings.cipherSuite.value_or(3));
     parameters.sessionTimeoutMs = settings.timeoutMs;
     parameters.retransmissionTimeoutMs = settings.retransmissionTimeoutMs;
     parameters.workaroundFlags = parameters.lan ? all.lan : all.inBand;
     return parameters;
+}
+
+/** A configured suite, or the automatic choice remembered per BMC in the
+ *  state directory. */
+CipherSuiteChoice cipherSuiteChoice(const Settings& settings)
+{
+    if (settings.cipherSuite)
+    {
+        return CipherSuiteChoice::fixed(
+            static_cast<std::uint8_t>(*settings.cipherSuite));
+    }
+    return CipherSuiteChoice::automatic(settings.stateDirectory);
 }
 
 } // namespace
@@ -110,8 +123,8 @@ makeIpmiSource(Settings settings, const std::string& configurationFile)
     {
         completeSettings(settings, configurationFile);
         Workaround flags;
-        auto session =
-            std::make_unique<IpmiSession>(sessionParameters(settings, flags));
+        auto session = std::make_unique<IpmiSession>(
+            sessionParameters(settings, flags), cipherSuiteChoice(settings));
         auto describer = std::make_unique<FreeIpmiDescriber>(
             *session, settings.stateDirectory, flags.sdrCreate, flags.sel);
         const std::string peer = session->peerName();

@@ -96,6 +96,20 @@ TEST_F(IpmiSettingsTest, EveryKeyIsParsed)
     EXPECT_EQ(ipmi.stateDirectory, "/var/lib/qx");
 }
 
+TEST_F(IpmiSettingsTest, CipherSuiteIsAutomaticUnlessConfigured)
+{
+    EXPECT_FALSE(Ipmi::Settings{}.cipherSuite.has_value());
+    const auto fixed =
+        Platform::parseConfiguration("ipmi.cipher-suite = 0\n", "a.conf");
+    EXPECT_EQ(fixed.ipmi.cipherSuite, 0u);
+    const auto automatic = Platform::parseConfiguration(
+        "ipmi.cipher-suite = 3\nipmi.cipher-suite = auto\n", "b.conf");
+    EXPECT_FALSE(automatic.ipmi.cipherSuite.has_value());
+    EXPECT_THAT(configurationError("ipmi.cipher-suite = 18\n"),
+                HasSubstr("ipmi.cipher-suite must be auto or a whole number "
+                          "from 0 to 17, not \"18\""));
+}
+
 TEST_F(IpmiSettingsTest, BadValuesNameTheKey)
 {
     EXPECT_EQ(configurationError("ipmi.interface = serial\n"),

@@ -1,9 +1,6 @@
 #include "SimulatedBmc.h"
 
-#include "Fixture.h"
-#include "NodeTree.h"
-#include "SystemEventRecord.h"
-#include "ipmi/FreeIpmiHandles.h"
+#include "BmcClient.h"
 
 #include <arpa/inet.h>
 #include <chrono>
@@ -154,32 +151,6 @@ std::uint32_t timestampOf(const Record& record)
            static_cast<std::uint32_t>(record[6]) << 24;
 }
 
-QX::Ipmi::SessionParameters sessionTo(const std::string& host,
-                                      const std::string& user,
-                                      const std::string& password,
-                                      unsigned timeoutMs)
-{
-    QX::Ipmi::SessionParameters parameters;
-    parameters.lan = true;
-    parameters.host = host;
-    parameters.user = user;
-    parameters.password = password;
-    parameters.privilege = IPMI_PRIVILEGE_LEVEL_ADMIN;
-    parameters.cipherSuite = 3;
-    parameters.sessionTimeoutMs = timeoutMs;
-    parameters.retransmissionTimeoutMs = std::min(timeoutMs / 4, 250u);
-    parameters.workaroundFlags =
-        IPMI_WORKAROUND_FLAGS_OUTOFBAND_2_0_OPEN_SESSION_PRIVILEGE;
-    return parameters;
-}
-
-QX::Ipmi::SessionParameters sessionTo(const SimulatedBmc& bmc,
-                                      unsigned timeoutMs)
-{
-    return sessionTo(bmc.host(), bmc.options().user, bmc.options().password,
-                     timeoutMs);
-}
-
 } // namespace
 
 SimulatedBmc::SimulatedBmc(Options options) : options_(std::move(options))
@@ -266,7 +237,9 @@ void SimulatedBmc::writeFiles(bool seedSel) const
                   options_.user + "\" \"" + options_.password +
                   "\" admin 10 none md2 md5 straight\n"
                   "console 127.0.0.1 " +
-                  std::to_string(consolePort_) + "\n" + moduleLine());
+                  std::to_string(consolePort_) + "\n" + moduleLine() +
+                  selModuleLine(options_.selBehaviour, options_.maxRecords,
+                                selFile()));
 
     std::string emulator = "mc_setbmc 0x20\n"
                            "mc_add 0x20 0 no-device-sdrs 0x23 9 8 0x9f 0x1291 "
@@ -293,6 +266,11 @@ void SimulatedBmc::writeFiles(bool seedSel) const
     }
     const fs::path state = dir / "state";
     fs::remove_all(state);
+    if (options_.selBehaviour.replaced)
+    {
+        writeSelFile(selFile(), options_.records);
+        return;
+    }
     const fs::path persist = state / "ipmi_sim" / simulatorName;
     fs::create_directories(persist);
     std::uint32_t lastAdd = 0;
@@ -386,7 +364,8 @@ void SimulatedBmc::waitUntilAnswering()
         }
         try
         {
-            QX::Ipmi::IpmiContext probe(sessionTo(*this, 500));
+            QX::Ipmi::IpmiContext probe(
+                sessionTo(host(), options_.user, options_.password, 500));
             return;
         }
         catch (const std::exception& error)
@@ -479,6 +458,20 @@ std::string SimulatedBmc::moduleLine() const
     return std::string("loadlib \"") + BMCSIM_RESTART_MODULE + "\" \"\"\n";
 }
 
+std::string SimulatedBmc::selFile() const
+{
+    return directory_ + "/module-sel.txt";
+}
+
+std::vector<Record> SimulatedBmc::moduleSel() const
+{
+    if (!options_.selBehaviour.replaced)
+    {
+        return {};
+    }
+    return readSelFile(selFile());
+}
+
 void SimulatedBmc::clearSel()
 {
     clearSelAt(host(), options_.user, options_.password);
@@ -491,192 +484,13 @@ void SimulatedBmc::startWatchdog(WatchdogAction action, unsigned tenths)
 
 void SimulatedBmc::setSelTime(std::uint32_t secondsSinceEpoch)
 {
-    QX::Ipmi::IpmiContext context(sessionTo(*this, 2000));
-    QX::Ipmi::FiidObject response(tmpl_cmd_set_sel_time_rs);
-    context.check(
-        ipmi_cmd_set_sel_time(context.get(), secondsSinceEpoch, response.get()),
-        "ipmi_cmd_set_sel_time", response, IPMI_NET_FN_STORAGE_RQ);
+    setSelTimeAt(host(), options_.user, options_.password, secondsSinceEpoch);
 }
 
 std::vector<std::uint16_t>
 SimulatedBmc::addRecords(const std::vector<Record>& records)
 {
     return addRecordsAt(host(), options_.user, options_.password, records);
-}
-
-std::vector<std::uint16_t> addRecordsAt(const std::string& host,
-                                        const std::string& user,
-                                        const std::string& password,
-                                        const std::vector<Record>& records)
-{
-    QX::Ipmi::IpmiContext context(sessionTo(host, user, password, 2000));
-    std::vector<std::uint16_t> ids;
-    for (const Record& record : records)
-    {
-        std::uint8_t request[17] = {0x44}; // Add SEL Entry
-        std::memcpy(request + 1, record.data(), record.size());
-        std::uint8_t response[16] = {};
-        const int length =
-            ipmi_cmd_raw(context.get(), 0, IPMI_NET_FN_STORAGE_RQ, request,
-                         sizeof request, response, sizeof response);
-        if (length < 0)
-        {
-            context.fail("ipmi_cmd_raw(Add SEL Entry)");
-        }
-        if (length < 4 || response[1] != 0)
-        {
-            char code[8];
-            std::snprintf(code, sizeof code, "%02Xh",
-                          length >= 2 ? response[1] : 0xFF);
-            throw std::runtime_error(
-                std::string("Add SEL Entry failed with completion code ") +
-                code);
-        }
-        ids.push_back(
-            static_cast<std::uint16_t>(response[2] | response[3] << 8));
-    }
-    return ids;
-}
-
-namespace
-{
-
-// Sends one raw request; throws unless the BMC answers with success.
-std::vector<std::uint8_t> rawCommand(QX::Ipmi::IpmiContext& context,
-                                     std::uint8_t netFn,
-                                     std::vector<std::uint8_t> request,
-                                     const char* what)
-{
-    std::uint8_t response[64] = {};
-    const int length = ipmi_cmd_raw(context.get(), 0, netFn, request.data(),
-                                    static_cast<unsigned>(request.size()),
-                                    response, sizeof response);
-    if (length < 0)
-    {
-        context.fail(what);
-    }
-    if (length < 2 || response[1] != 0)
-    {
-        char code[8];
-        std::snprintf(code, sizeof code, "%02Xh",
-                      length >= 2 ? response[1] : 0xFF);
-        throw std::runtime_error(std::string(what) +
-                                 " failed with completion code " + code);
-    }
-    return std::vector<std::uint8_t>(response, response + length);
-}
-
-} // namespace
-
-void clearSelAt(const std::string& host, const std::string& user,
-                const std::string& password)
-{
-    QX::Ipmi::IpmiContext context(sessionTo(host, user, password, 2000));
-    const auto reserved =
-        rawCommand(context, IPMI_NET_FN_STORAGE_RQ, {0x42}, "Reserve SEL");
-    if (reserved.size() < 4)
-    {
-        throw std::runtime_error("Reserve SEL gave a short answer");
-    }
-    // Clear SEL: reservation, "CLR", initiate erase.
-    rawCommand(context, IPMI_NET_FN_STORAGE_RQ,
-               {0x47, reserved[2], reserved[3], 'C', 'L', 'R', 0xAA},
-               "Clear SEL");
-}
-
-void startWatchdogAt(const std::string& host, const std::string& user,
-                     const std::string& password, WatchdogAction action,
-                     unsigned tenths)
-{
-    QX::Ipmi::IpmiContext context(sessionTo(host, user, password, 2000));
-    // Set Watchdog Timer: use SMS/OS (04h), the action, no pre-timeout,
-    // clear the SMS/OS expiration flag, the countdown in 100 ms.
-    rawCommand(context, IPMI_NET_FN_APP_RQ,
-               {0x24, 0x04, static_cast<std::uint8_t>(action), 0x00, 0x10,
-                static_cast<std::uint8_t>(tenths & 0xFF),
-                static_cast<std::uint8_t>(tenths >> 8)},
-               "Set Watchdog Timer");
-    rawCommand(context, IPMI_NET_FN_APP_RQ, {0x22}, "Reset Watchdog Timer");
-}
-
-std::vector<Record> generatedRecords(unsigned count, std::uint16_t firstId,
-                                     std::uint32_t lastTime)
-{
-    // Sensor type, number, event type, data 1-3.
-    static const EventBytes events[] = {
-        {0x01, 0x30, 0x01, 0x57, 0x52, 0x50}, // temperature above threshold
-        {0x01, 0x30, 0x81, 0x57, 0x4e, 0x50}, // ... and back
-        {0x04, 0x43, 0x01, 0x52, 0x05, 0x06}, // fan below threshold
-        {0x08, 0x52, 0x6f, 0x03, 0xff, 0xff}, // power supply AC lost
-        {0x0c, 0x60, 0x6f, 0xa0, 0x00, 0x01}, // correctable ECC
-        {0x23, 0x00, 0x6f, 0xc1, 0x04, 0xff}, // watchdog hard reset
-    };
-    std::vector<Record> records;
-    records.reserve(count);
-    for (unsigned i = 0; i < count; ++i)
-    {
-        const unsigned id = firstId + i;
-        const std::uint32_t time = lastTime - (count - 1 - i);
-        records.push_back(systemEventRecord(static_cast<std::uint16_t>(id),
-                                            time,
-                                            events[i % std::size(events)]));
-    }
-    return records;
-}
-
-Record parseRecord(const std::string& hex)
-{
-    Record record{};
-    std::istringstream in(hex);
-    for (std::uint8_t& byte : record)
-    {
-        std::string pair;
-        if (!(in >> pair) || pair.size() != 2 ||
-            pair.find_first_not_of("0123456789abcdefABCDEF") !=
-                std::string::npos)
-        {
-            throw std::invalid_argument("not 16 hexadecimal bytes: \"" + hex +
-                                        "\"");
-        }
-        byte = static_cast<std::uint8_t>(std::stoul(pair, nullptr, 16));
-    }
-    return record;
-}
-
-std::vector<Record> fixtureRecords(const std::string& fixtureFile)
-{
-    std::shared_ptr<const QX::NodeTree> tree;
-    if (fixtureFile.empty())
-    {
-        std::istringstream sample(QX::builtinSampleFixture());
-        tree = QX::parseFixture(sample, "built-in sample SEL");
-    }
-    else
-    {
-        tree = QX::loadFixtureFile(fixtureFile);
-    }
-    std::vector<Record> records;
-    for (const auto id : tree->nodesOfKind(QX::NodeLexicon::EventLogEntry))
-    {
-        const QX::PropertyValue* data =
-            tree->node(id).find(QX::NodeLexicon::RecordData);
-        if (data != nullptr && std::holds_alternative<std::string>(*data))
-        {
-            records.push_back(parseRecord(std::get<std::string>(*data)));
-        }
-    }
-    return records;
-}
-
-std::vector<Sensor> sampleSensors()
-{
-    return {
-        {0x01, 0x10, 0x6f, "SEL"},          {0x30, 0x01, 0x01, "CPU1 Temp"},
-        {0x43, 0x04, 0x01, "FAN3"},         {0x14, 0x02, 0x01, "12V"},
-        {0x52, 0x08, 0x6f, "PSU2"},         {0x60, 0x0c, 0x6f, "DIMM_A1"},
-        {0x11, 0x07, 0x6f, "CPU2"},         {0x71, 0x23, 0x6f, "Watchdog 2"},
-        {0x83, 0x12, 0x6f, "System Event"},
-    };
 }
 
 } // namespace bmcsim

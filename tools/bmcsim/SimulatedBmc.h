@@ -5,6 +5,8 @@
 // records seeded through the simulator's persist file, and the process
 // stopped by its PID.
 
+#include "SelBehaviour.h"
+
 #include <array>
 #include <cstdint>
 #include <string>
@@ -13,8 +15,6 @@
 
 namespace bmcsim
 {
-
-using Record = std::array<std::uint8_t, 16>;
 
 /** A sensor named in the simulator's SDR (a compact sensor record). */
 struct Sensor
@@ -44,6 +44,9 @@ struct Options
     /** Load the project's simulator module (restart cause, watchdog
      *  actions) when it was built. */
     bool restartModule = true;
+    /** The SEL of a chosen real BMC in place of the simulator's own (needs
+     *  the SEL module); the records above seed it. */
+    SelBehaviour selBehaviour;
 };
 
 /** Watchdog actions of Set Watchdog Timer. */
@@ -117,9 +120,13 @@ class SimulatedBmc
     }
     /** The ipmitool command line prefix for this simulator. */
     std::string ipmitool() const;
+    /** The SEL as the SEL module holds it (oldest first), read from its
+     *  file rather than over IPMI; empty without the module. */
+    std::vector<Record> moduleSel() const;
 
   private:
     void writeFiles(bool seedSel) const;
+    std::string selFile() const;
     std::string moduleLine() const;
     void launch();
     void waitUntilAnswering();
@@ -141,7 +148,12 @@ std::vector<std::uint16_t> addRecordsAt(const std::string& host,
                                         const std::string& password,
                                         const std::vector<Record>& records);
 
-/** Clears the SEL of the simulator at @p host. */
+/** Sets the SEL clock of the simulator at @p host. */
+void setSelTimeAt(const std::string& host, const std::string& user,
+                  const std::string& password, std::uint32_t secondsSinceEpoch);
+
+/** Clears the SEL of the simulator at @p host (with reservation 0 where
+ *  Reserve SEL is refused); the erase may go on in the background. */
 void clearSelAt(const std::string& host, const std::string& user,
                 const std::string& password);
 

@@ -3,9 +3,14 @@
 //
 //   bmcsim start --dir DIR [--max-records N] [--no-sel-time]
 //                [--fixture FILE | --sample | --generate N]
+//                [--sel-behaviour frozen-ring | background-clear |
+//                                 reserve-c1 | reserve-d4]
 //       starts ipmi_sim on a free loopback port with the project's
 //       configuration in DIR and prints "host=127.0.0.1:PORT" and
-//       "pid=PID"; the simulator keeps running
+//       "pid=PID"; the simulator keeps running. --sel-behaviour gives it
+//       the SEL of some real BMCs (the SEL module): a full ring buffer
+//       whose Get SEL Info never changes, a Clear SEL that erases for 3 s
+//       in the background, or Reserve SEL refused with C1h or D4h
 //   bmcsim add --dir DIR --count N     adds N records over IPMI
 //   bmcsim clear --dir DIR             clears the SEL over IPMI
 //   bmcsim watchdog --dir DIR [--tenths N]
@@ -31,6 +36,8 @@ namespace
 constexpr const char* usage =
     "usage: bmcsim start --dir DIR [--max-records N] [--no-sel-time]\n"
     "                    [--fixture FILE | --sample | --generate N]\n"
+    "                    [--sel-behaviour frozen-ring | background-clear |\n"
+    "                                     reserve-c1 | reserve-d4]\n"
     "       bmcsim add --dir DIR --count N\n"
     "       bmcsim clear --dir DIR\n"
     "       bmcsim watchdog --dir DIR [--tenths N]\n"
@@ -49,6 +56,24 @@ unsigned number(const std::string& text)
         throw UsageError("not a number: \"" + text + "\"");
     }
     return static_cast<unsigned>(std::stoul(text));
+}
+
+bmcsim::SelBehaviour selBehaviour(const std::string& name)
+{
+    if (name == "frozen-ring")
+    {
+        return bmcsim::SelBehaviour::frozenRing();
+    }
+    if (name == "background-clear")
+    {
+        return bmcsim::SelBehaviour::backgroundClear(3000);
+    }
+    if (name == "reserve-c1" || name == "reserve-d4")
+    {
+        return bmcsim::SelBehaviour::reserveRefused(
+            name == "reserve-c1" ? 0xC1 : 0xD4);
+    }
+    throw UsageError("unknown SEL behaviour \"" + name + "\"");
 }
 
 std::string readLine(const std::string& path)
@@ -197,6 +222,10 @@ int main(int argc, char** argv)
             settings.records = bmcsim::generatedRecords(
                 number(options["--generate"]), 1,
                 static_cast<std::uint32_t>(std::time(nullptr)));
+        }
+        if (options.count("--sel-behaviour"))
+        {
+            settings.selBehaviour = selBehaviour(options["--sel-behaviour"]);
         }
         settings.sensors = bmcsim::sampleSensors();
         bmcsim::SimulatedBmc bmc(settings);
