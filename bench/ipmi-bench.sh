@@ -8,13 +8,22 @@
 #
 # For 1,000 and 5,000 records: ipmi-sel (LAN 2.0), ipmitool sel elist, the
 # provider's EnumerateInstances of ZAN_MgmtHwLogEntry through the host in a
-# new selprov process (cold) and as the second request of one selprov batch
+# new selprov process (cold: the SEL copy kept by the run before removed)
+# and as the second request of one selprov batch
 # (warm, unchanged SEL; selprov --timing), the same warm request on the
 # in-memory source with the same number of entries (what the layers above
 # the platform cost on their own), the warm EnumerateInstances of
 # ZAN_MgmtHwLog (one instance: mostly the IPMI source's own cost), and on
 # 5,000 records both requests right after 10 records were added.
-# Each figure is the median of RUNS runs (default 3).
+#
+# Then the restart case at 3,000 records: a new selprov process that finds
+# the SEL copy an earlier process kept (ipmi.state-directory) against an
+# unchanged SEL, against 10 records added since, and right after a clear,
+# beside a cold process without a kept copy and ipmi-sel in the same run;
+# each with the IPMI requests the process sent after its session opened
+# (the session's counter, as selprov --timing prints it).
+# Each figure is the median of RUNS runs (default 3). BENCH_PART=restart
+# runs the restart table alone, BENCH_PART=read the first one alone.
 set -euo pipefail
 cd "$(dirname "$0")/.."
 
@@ -94,20 +103,33 @@ row() { # what records seconds reference
         "$(echo "$3 * 1000" | bc -l)" "$(ratio "$3" "$4")"
 }
 
+part=${BENCH_PART:-all}
+
+# Without the SEL copy an earlier process kept: a cold start.
+drop_copy() { rm -f "$bench"/platform-state/sel-copy-*; }
+cold_selprov() { drop_copy; "$bin/selprov" "$@"; }
+
+# Starts the simulator with N records and writes the IPMI configuration;
+# sets host and port.
+start_simulator() { # records
+    "$bin/bmcsim" stop --dir "$bench/sim" >/dev/null 2>&1 || true
+    rm -rf "$bench/sim" "$bench/platform-state"
+    mkdir -p "$bench/sim"
+    # Room for the records and the ones added later, below 4096 free
+    # records so that the 16-bit free-space field does not wrap.
+    local simulator
+    simulator=$("$bin/bmcsim" start --dir "$bench/sim" --generate "$1" \
+        --max-records $(($1 + 100)))
+    host=$(sed -n 's/^host=//p' <<<"$simulator")
+    port=${host##*:}
+    simulated_bmc_conf "$bench/ipmi.conf" "$host" "$bench" "log.sink = none"
+}
+
+if [[ $part != restart ]]; then
 echo "| measurement | records | ms | vs ipmi-sel |"
 echo "|---|---|---|---|"
 for records in 1000 5000; do
-    "$bin/bmcsim" stop --dir "$bench/sim" >/dev/null 2>&1 || true
-    rm -rf "$bench/sim"
-    mkdir -p "$bench/sim"
-    # Room for the records and the 10 added later, below 4096 free records
-    # so that the 16-bit free-space field does not wrap.
-    simulator=$("$bin/bmcsim" start --dir "$bench/sim" --generate "$records" \
-        --max-records $((records + 100)))
-    host=$(sed -n 's/^host=//p' <<<"$simulator")
-    port=${host##*:}
-
-    simulated_bmc_conf "$bench/ipmi.conf" "$host" "$bench" "log.sink = none"
+    start_simulator "$records"
     "$bin/selfixture" "$records" >"$bench/memory.fixture"
     printf 'source = memory\nmemory.fixture = %s\nlog.sink = none\n' \
         "$bench/memory.fixture" >"$bench/memory.conf"
@@ -128,12 +150,12 @@ for records in 1000 5000; do
     row "ipmi-sel (FreeIPMI, LAN 2.0)" "$records" "$reference" "$reference"
     row "ipmitool sel elist" "$records" \
         "$(median_seconds "${ipmitool[@]}" sel elist)" "$reference"
-    row "selprov enumerate, cold (new process)" "$records" \
-        "$(median_seconds "${selprov[@]}" enumerate ZAN_MgmtHwLogEntry)" \
-        "$reference"
-    row "selprov enumerate the log, cold (new process)" "$records" \
-        "$(median_seconds "${selprov[@]}" enumerate ZAN_MgmtHwLog)" \
-        "$reference"
+    row "selprov enumerate, cold (new process, no kept copy)" "$records" \
+        "$(median_seconds cold_selprov --config "$bench/ipmi.conf" \
+            enumerate ZAN_MgmtHwLogEntry)" "$reference"
+    row "selprov enumerate the log, cold (no kept copy)" "$records" \
+        "$(median_seconds cold_selprov --config "$bench/ipmi.conf" \
+            enumerate ZAN_MgmtHwLog)" "$reference"
     row "Enumerate entries, warm (2nd request of a batch)" "$records" \
         "$(warm_request "$bench/ipmi.conf" ZAN_MgmtHwLogEntry)" "$reference"
     row "  the same on the in-memory source" "$records" \
@@ -150,3 +172,63 @@ for records in 1000 5000; do
             "$(ten_new_records "$bench/ipmi.conf" ZAN_MgmtHwLog)" "$reference"
     fi
 done
+fi
+[[ $part == read ]] && exit 0
+
+# One new selprov process: "seconds requests" (wall time, and the IPMI
+# requests it sent after its session opened).
+restart_run() { # config
+    local start end requests
+    start=$(now)
+    "$bin/selprov" --config "$1" --timing enumerate ZAN_MgmtHwLogEntry \
+        >/dev/null 2>"$bench/timing"
+    end=$(now)
+    requests=$(sed -n 's/^selprov: IPMI requests so far \([0-9]*\)$/\1/p' \
+        "$bench/timing" | tail -n 1)
+    echo "$(echo "$end - $start" | bc -l) ${requests:-?}"
+}
+# The median run of RUNS, each after "$@" (a command run untimed first).
+restart_median() { # config command...
+    local config=$1
+    shift
+    for ((i = 0; i < runs; i++)); do
+        "$@"
+        restart_run "$config"
+    done | sort -g | awk '{ l[NR] = $0 } END { print l[int((NR + 1) / 2)] }'
+}
+restart_row() { # what records "seconds requests" reference
+    local seconds=${3% *} requests=${3#* }
+    printf '| %-46s | %6s | %8s | %10.3f | %9.4fx | %8.1fx |\n' "$1" "$2" \
+        "$requests" "$(echo "$seconds * 1000" | bc -l)" \
+        "$(ratio "$seconds" "$4")" "$(ratio "$4" "$seconds")"
+}
+nothing() { :; }
+add_ten() { "$bin/bmcsim" add --dir "$bench/sim" --count 10; }
+clear_sel() { "$bin/bmcsim" clear --dir "$bench/sim"; }
+
+records=3000
+start_simulator "$records"
+ipmisel=(ipmi-sel -D LAN_2_0 -h "$host" -u admin -p password -l ADMIN
+         -W opensesspriv --sdr-cache-directory="$bench/sdrcache" --quiet-cache)
+mkdir -p "$bench/sdrcache"
+"${ipmisel[@]}" --sdr-cache-recreate >/dev/null 2>&1
+# Builds the SDR cache and the first kept copy.
+"$bin/selprov" --config "$bench/ipmi.conf" enumerate-names ZAN_MgmtHwLog \
+    >/dev/null
+reference=$(median_seconds "${ipmisel[@]}")
+
+echo
+echo "| new selprov process (enumerate entries) | records | requests | ms | vs ipmi-sel | faster |"
+echo "|---|---|---|---|---|---|"
+printf '| %-46s | %6s | %8s | %10.3f | %9.4fx | %8.1fx |\n' \
+    "ipmi-sel (FreeIPMI, LAN 2.0)" "$records" "-" \
+    "$(echo "$reference * 1000" | bc -l)" 1 1
+restart_row "cold: no kept copy" "$records" \
+    "$(restart_median "$bench/ipmi.conf" drop_copy)" "$reference"
+restart_run "$bench/ipmi.conf" >/dev/null # keeps the copy again
+restart_row "restart, unchanged SEL" "$records" \
+    "$(restart_median "$bench/ipmi.conf" nothing)" "$reference"
+restart_row "restart, 10 records added meanwhile" "$records+10" \
+    "$(restart_median "$bench/ipmi.conf" add_ten)" "$reference"
+restart_row "restart after a clear" "0" \
+    "$(restart_median "$bench/ipmi.conf" clear_sel)" "$reference"

@@ -2,10 +2,12 @@
 // operation on it, printing the result as MOF-like text or JSON.
 #include "CommandLine.h"
 #include "Host.h"
+#include "Platform.h"
 #include "Printing.h"
 #include "ResultSpool.h"
 #include "StatusText.h"
 #include "Watch.h"
+#include "ipmi/IpmiSource.h"
 
 #include <cerrno>
 #include <chrono>
@@ -105,9 +107,28 @@ void printReturnValue(const selprov::Options& o, const host::Outcome& out)
     }
 }
 
+// With --timing on a BMC: the IPMI requests the process has sent so far.
+void printIpmiRequests()
+{
+    try
+    {
+        const auto ipmi = std::dynamic_pointer_cast<QX::Ipmi::IpmiSource>(
+            QX::Platform::currentSource());
+        if (ipmi)
+        {
+            std::cerr << "selprov: IPMI requests so far "
+                      << ipmi->requestCount() << "\n";
+        }
+    }
+    catch (const std::exception&)
+    {
+        // No source to ask: the request has said why.
+    }
+}
+
 // Calls the provider; with --timing, writes how long the call took (the
 // provider's work, the broker's and the formatting of the results, without
-// printing) to standard error.
+// printing) to standard error, and the IPMI requests sent so far.
 template <typename Call>
 host::Outcome timed(const selprov::Options& o, Call call)
 {
@@ -119,6 +140,7 @@ host::Outcome timed(const selprov::Options& o, Call call)
             std::chrono::steady_clock::now() - began;
         std::cerr << "selprov: request took " << std::fixed
                   << std::setprecision(3) << took.count() << " ms\n";
+        printIpmiRequests();
     }
     return out;
 }

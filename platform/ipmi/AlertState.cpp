@@ -1,16 +1,10 @@
 #include "AlertState.h"
 
+#include "AtomicFile.h"
 #include "SelRecord.h"
 
-#include <cerrno>
-#include <cstdio>
-#include <cstring>
-#include <fcntl.h>
-#include <filesystem>
 #include <map>
 #include <sstream>
-#include <stdexcept>
-#include <unistd.h>
 
 namespace QX::Ipmi
 {
@@ -61,19 +55,6 @@ bool printableKey(const std::string& key)
         }
     }
     return true;
-}
-
-void closeQuietly(int fd)
-{
-    if (fd >= 0)
-    {
-        ::close(fd);
-    }
-}
-
-[[noreturn]] void fail(const std::string& what, const std::string& path)
-{
-    throw std::runtime_error(what + " " + path + ": " + std::strerror(errno));
 }
 
 } // namespace
@@ -187,106 +168,19 @@ std::optional<AnnouncedState> parseAlertState(const std::string& text,
 std::optional<AnnouncedState> readAlertState(const std::string& path,
                                              std::string& problem)
 {
-    const int fd = ::open(path.c_str(), O_RDONLY | O_CLOEXEC);
-    if (fd < 0)
+    // A valid file is a few hundred bytes; a longer one is not read.
+    constexpr std::size_t limit = 4096;
+    const std::optional<std::string> text = readSmallFile(path, limit, problem);
+    if (!text)
     {
-        problem = std::strerror(errno);
         return std::nullopt;
     }
-    // A valid file is a few hundred bytes; read a little more to tell
-    // a longer one.
-    constexpr std::size_t limit = 4096;
-    std::string text;
-    char buffer[1024];
-    for (;;)
-    {
-        const ssize_t got = ::read(fd, buffer, sizeof buffer);
-        if (got < 0 && errno == EINTR)
-        {
-            continue;
-        }
-        if (got < 0)
-        {
-            problem = std::strerror(errno);
-            closeQuietly(fd);
-            return std::nullopt;
-        }
-        if (got == 0)
-        {
-            break;
-        }
-        text.append(buffer, static_cast<std::size_t>(got));
-        if (text.size() > limit)
-        {
-            problem = "the file is too long";
-            closeQuietly(fd);
-            return std::nullopt;
-        }
-    }
-    closeQuietly(fd);
-    return parseAlertState(text, problem);
+    return parseAlertState(*text, problem);
 }
 
 void writeAlertState(const std::string& path, const AnnouncedState& state)
 {
-    const std::filesystem::path target(path);
-    const std::filesystem::path directory = target.parent_path();
-    if (!directory.empty())
-    {
-        std::error_code ignored;
-        std::filesystem::create_directories(directory, ignored);
-    }
-    const std::string temporary = path + ".tmp";
-    const std::string text = formatAlertState(state);
-
-    const int fd = ::open(temporary.c_str(),
-                          O_WRONLY | O_CREAT | O_TRUNC | O_CLOEXEC, 0600);
-    if (fd < 0)
-    {
-        fail("cannot create", temporary);
-    }
-    std::size_t written = 0;
-    while (written < text.size())
-    {
-        const ssize_t put =
-            ::write(fd, text.data() + written, text.size() - written);
-        if (put < 0 && errno == EINTR)
-        {
-            continue;
-        }
-        if (put < 0)
-        {
-            const int saved = errno;
-            closeQuietly(fd);
-            errno = saved;
-            fail("cannot write", temporary);
-        }
-        written += static_cast<std::size_t>(put);
-    }
-    if (::fsync(fd) != 0)
-    {
-        const int saved = errno;
-        closeQuietly(fd);
-        errno = saved;
-        fail("cannot flush", temporary);
-    }
-    if (::close(fd) != 0)
-    {
-        fail("cannot close", temporary);
-    }
-    if (::rename(temporary.c_str(), path.c_str()) != 0)
-    {
-        fail("cannot rename to", path);
-    }
-    // The rename itself lasts once the directory is on the disk.
-    const std::string dirName = directory.empty() ? "." : directory.string();
-    const int dirFd =
-        ::open(dirName.c_str(), O_RDONLY | O_DIRECTORY | O_CLOEXEC);
-    if (dirFd >= 0)
-    {
-        ::fsync(dirFd);
-        ::close(dirFd);
-    }
+    writeFileAtomically(path, formatAlertState(state));
 }
 
 } // namespace QX::Ipmi

@@ -5,6 +5,7 @@
 
 #include <cstdio>
 #include <filesystem>
+#include <sys/stat.h>
 
 namespace QX::Ipmi
 {
@@ -91,6 +92,7 @@ bool FreeIpmiDescriber::openOrBuildCache(IpmiContext& context)
     }
     const auto opened = [this]
     {
+        namesFile_ = cacheFile();
         named_.emplace(sdr_.get());
         setFlags(*named_, selFlags_);
     };
@@ -165,9 +167,30 @@ bool FreeIpmiDescriber::openCacheFile(const std::string& file)
     {
         return false;
     }
+    namesFile_ = file;
     named_.emplace(sdr_.get());
     setFlags(*named_, selFlags_);
     return true;
+}
+
+std::string FreeIpmiDescriber::textsKey() const
+{
+    // Bump the leading word when the texts this class makes change.
+    std::string key = "freeipmi-texts-1 flags " + std::to_string(selFlags_);
+    if (!named_)
+    {
+        return key + " unnamed";
+    }
+    struct stat info
+    {
+    };
+    if (::stat(namesFile_.c_str(), &info) != 0)
+    {
+        return {};
+    }
+    return key + " sdr " + namesFile_ + " " + std::to_string(info.st_size) +
+           " " + std::to_string(info.st_mtim.tv_sec) + "." +
+           std::to_string(info.st_mtim.tv_nsec);
 }
 
 std::string FreeIpmiDescriber::describe(const SelRecordBytes& record)

@@ -33,6 +33,9 @@ class FreeIpmiDescriber : public RecordDescriber
 
     bool refreshSensorNames() override;
     std::string describe(const SelRecordBytes& record) override;
+    /** The interpretation flags and the SDR cache file in use with its
+     *  size and modification time (a rebuilt cache is another file). */
+    std::string textsKey() const override;
 
     /**
      * Names sensors from the SDR cache file @p file as it stands, without
@@ -55,7 +58,8 @@ class FreeIpmiDescriber : public RecordDescriber
     // FreeIPMI takes an SDR context for a SEL context only while its cache
     // is open: this one lives exactly as long as the open cache.
     std::optional<SelContext> named_;
-    SelContext unnamed_; // sensor numbers only
+    std::string namesFile_; // the cache file named_ reads
+    SelContext unnamed_;    // sensor numbers only
     bool cacheProblemLogged_ = false;
     std::uint64_t checkedGeneration_ = 0;
 };

@@ -5,6 +5,7 @@
 #include "SelRecordText.h"
 
 #include <cstdio>
+#include <filesystem>
 
 namespace QX::Ipmi
 {
@@ -28,7 +29,7 @@ IpmiSource::IpmiSource(std::unique_ptr<BmcCommands> bmc,
                        std::unique_ptr<RecordDescriber> describer,
                        const Settings& settings,
                        std::string controllerDescription,
-                       std::string alertStateFile) :
+                       std::string alertStateFile, SelCopyPlace selCopy) :
     bmc_(std::move(bmc)),
     describer_(std::move(describer)), settings_(settings),
     controllerDescription_(std::move(controllerDescription)),
@@ -36,6 +37,7 @@ IpmiSource::IpmiSource(std::unique_ptr<BmcCommands> bmc,
           [bmc = bmc_.get()] { return bmc->lastActivity(); }),
     cache_(std::chrono::milliseconds(settings.clearWaitMs),
            std::chrono::seconds(settings.selVerifySeconds)),
+    selCopy_(std::move(selCopy)),
     monitor_([this](const std::function<void(const SelObservation&)>& use)
              { look(use); },
              alertOf, std::chrono::milliseconds(settings.pollIntervalMs),
@@ -87,7 +89,9 @@ std::shared_ptr<const NodeTree> IpmiSource::snapshot()
 
 std::shared_ptr<const NodeTree> IpmiSource::refreshTree()
 {
+    loadKeptCopy();
     const SelChange change = cache_.refresh(*bmc_, *describer_);
+    keepCopy();
     if (change == SelChange::Replaced)
     {
         rebuildEntries();
@@ -114,6 +118,67 @@ std::shared_ptr<const NodeTree> IpmiSource::refreshTree()
         builderChanged_ = false;
     }
     return tree_;
+}
+
+void IpmiSource::loadKeptCopy()
+{
+    if (copyLoaded_ || selCopy_.file.empty())
+    {
+        return;
+    }
+    copyLoaded_ = true;
+    std::string problem;
+    std::optional<KeptSel> kept =
+        readSelCopy(selCopy_.file, selCopy_.bmcKey, problem);
+    if (!kept)
+    {
+        logLine(logLevelInfo, "IpmiSource", __LINE__,
+                "No SEL copy in " + selCopy_.file + " (" + problem +
+                    "): the whole SEL is read");
+        return;
+    }
+    copyWritten_ = kept;
+    cache_.adopt(std::move(*kept));
+}
+
+void IpmiSource::keepCopy()
+{
+    if (selCopy_.file.empty())
+    {
+        return;
+    }
+    // Only a change of the copy is compared with the file.
+    const CopyStamp stamp{cache_.version(), cache_.info(), cache_.clearSeen()};
+    if (stamp == copyStamp_)
+    {
+        return;
+    }
+    copyStamp_ = stamp;
+    std::optional<KeptSel> copy = cache_.keep(describer_->textsKey());
+    if (!copy)
+    {
+        return; // not known to be true: the file keeps what it had
+    }
+    copy->bmcKey = selCopy_.bmcKey;
+    if (copy == copyWritten_)
+    {
+        return;
+    }
+    try
+    {
+        writeSelCopy(selCopy_.file, *copy);
+        copyWritten_ = std::move(copy);
+        copyFailing_ = false;
+    }
+    catch (const std::exception& error)
+    {
+        // Costs the next process a whole read, nothing else; said once.
+        if (!copyFailing_)
+        {
+            logFailure("Keeping the SEL copy", error);
+            copyFailing_ = true;
+        }
+    }
 }
 
 void IpmiSource::rebuildEntries()
@@ -229,6 +294,14 @@ bool IpmiSource::writeProperty(const std::string& path,
 
 void IpmiSource::clearSel()
 {
+    // The kept copy is of a SEL that is going away; a process started
+    // before the next refresh reads the whole SEL.
+    if (!selCopy_.file.empty())
+    {
+        std::error_code ignored;
+        std::filesystem::remove(selCopy_.file, ignored);
+        copyWritten_.reset();
+    }
     cache_.erase(*bmc_);
 }
 

@@ -27,6 +27,10 @@ namespace QX::Ipmi
  * does not implement the command). Writing ClearEventLogCommand to the
  * controller's Command property clears the SEL.
  *
+ * The SEL copy outlives the process in a file (SelCopyFile): the first
+ * request of a process loads it and has the BMC confirm it like any later
+ * request, and every change of the copy is written back.
+ *
  * Every snapshot asks the BMC whether its SEL changed (SelCache) and hands
  * out the same immutable tree while it has not; added records are added
  * to the tree without reading the others again. One request at a time
@@ -58,11 +62,13 @@ class IpmiSource : public InstrumentationSource
      * @param controllerDescription description of the controller node
      * @param alertStateFile where monitoring keeps what it announced;
      *        empty: nothing is kept across processes
+     * @param selCopy where the SEL copy is kept for the next process, and
+     *        the BMC's key; an empty file: the copy is not kept
      */
     IpmiSource(std::unique_ptr<BmcCommands> bmc,
                std::unique_ptr<RecordDescriber> describer,
                const Settings& settings, std::string controllerDescription,
-               std::string alertStateFile = {});
+               std::string alertStateFile = {}, SelCopyPlace selCopy = {});
     ~IpmiSource() override;
 
     std::shared_ptr<const NodeTree> snapshot() override;
@@ -107,6 +113,8 @@ class IpmiSource : public InstrumentationSource
     void applyRestartCause();
     void clearSel();
     void look(const std::function<void(const SelObservation&)>& use);
+    void loadKeptCopy();
+    void keepCopy();
 
     // Declared before the describer, which may refer to it.
     std::unique_ptr<BmcCommands> bmc_;
@@ -123,6 +131,18 @@ class IpmiSource : public InstrumentationSource
     std::optional<LogState> logState_;
     std::optional<std::uint8_t> restartCause_;
     std::optional<std::uint64_t> restartCauseGeneration_;
+    SelCopyPlace selCopy_;
+    bool copyLoaded_ = false;
+    std::optional<KeptSel> copyWritten_; // what the file holds
+    struct CopyStamp
+    {
+        std::uint64_t version = 0;
+        SelInfo info;
+        bool clearSeen = false;
+        bool operator==(const CopyStamp&) const = default;
+    };
+    std::optional<CopyStamp> copyStamp_;
+    bool copyFailing_ = false;
 
     SelMonitor monitor_; // last: its poller stops before the rest goes
 };

@@ -132,9 +132,17 @@ makeIpmiSource(Settings settings, const std::string& configurationFile)
             settings.stateDirectory.empty()
                 ? std::string()
                 : settings.stateDirectory + "/sel-alerts-" + session->peerKey();
+        SelCopyPlace selCopy;
+        if (!settings.stateDirectory.empty())
+        {
+            selCopy.bmcKey = session->peerKey();
+            selCopy.file =
+                settings.stateDirectory + "/sel-copy-" + selCopy.bmcKey;
+        }
         auto source = std::make_shared<IpmiSource>(
             std::move(session), std::move(describer), settings,
-            "Baseboard Management Controller, " + peer, alertState);
+            "Baseboard Management Controller, " + peer, alertState,
+            std::move(selCopy));
         const unsigned sessionIdleMs = std::min(settings.timeoutMs / 2, 15000u);
         if (settings.interface == Interface::Lan &&
             settings.pollIntervalMs >= sessionIdleMs)

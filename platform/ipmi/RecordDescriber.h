@@ -26,6 +26,15 @@ class RecordDescriber
 
     /** The event text of @p record; never empty. */
     virtual std::string describe(const SelRecordBytes& record) = 0;
+
+    /** Names everything besides a record's bytes that its text depends on
+     *  now (the sensor names in use, the interpretation flags), so that
+     *  texts made under an equal key in another process can be used as
+     *  they are. Empty: texts are always made again. */
+    virtual std::string textsKey() const
+    {
+        return {};
+    }
 };
 
 } // namespace QX::Ipmi

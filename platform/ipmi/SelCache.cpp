@@ -37,6 +37,8 @@ SelChange SelCache::refresh(BmcCommands& bmc, RecordDescriber& describer)
             throw;
         }
     }
+    // Loaded after the sensor names, so that its texts have them.
+    useKept(describer);
     const bool verifyDue =
         verifyEvery_.count() > 0 &&
         std::chrono::steady_clock::now() - lastWholeRead_ >= verifyEvery_;
@@ -66,6 +68,14 @@ SelChange SelCache::refresh(BmcCommands& bmc, RecordDescriber& describer)
                                                : SelChange::None;
     }
 
+    if (keptUnshown_)
+    {
+        // Every record of a loaded copy is new to whoever shows it, also
+        // when the refresh that loaded it failed half-way.
+        keptUnshown_ = false;
+        firstNew_ = 0;
+        change = SelChange::Replaced;
+    }
     if (namesChanged && change != SelChange::Replaced)
     {
         for (CachedRecord& record : records_)
@@ -79,6 +89,72 @@ SelChange SelCache::refresh(BmcCommands& bmc, RecordDescriber& describer)
         ++version_;
     }
     return change;
+}
+
+bool SelCache::useKept(RecordDescriber& describer)
+{
+    if (!kept_)
+    {
+        return false;
+    }
+    KeptSel kept = std::move(*kept_);
+    kept_.reset();
+    if (trusted_ || !records_.empty() ||
+        lastWholeRead_ != std::chrono::steady_clock::time_point{})
+    {
+        return false; // this process has read the SEL itself
+    }
+    // Texts made under the same names are used as they are; describing
+    // every record is most of what loading a large copy costs.
+    const std::string textsKey = describer.textsKey();
+    const bool textsFit = !textsKey.empty() && kept.textsKey == textsKey &&
+                          kept.texts.size() == kept.records.size();
+    records_.reserve(kept.records.size());
+    for (std::size_t i = 0; i < kept.records.size(); ++i)
+    {
+        if (textsFit)
+        {
+            append(kept.records[i], std::move(kept.texts[i]));
+        }
+        else
+        {
+            append(kept.records[i], describer);
+        }
+    }
+    info_ = kept.info;
+    clearSeen_ = kept.clearSeen;
+    // From here on the kept copy is checked as a copy read by this
+    // process: the refresh that loaded it compares it with the BMC.
+    trusted_ = true;
+    keptUnshown_ = true;
+    lastWholeRead_ = std::chrono::steady_clock::now();
+    return true;
+}
+
+std::optional<KeptSel> SelCache::keep(const std::string& textsKey) const
+{
+    if (!trusted_)
+    {
+        return std::nullopt;
+    }
+    KeptSel kept;
+    kept.info = info_;
+    kept.clearSeen = clearSeen_;
+    kept.records.reserve(records_.size());
+    for (const CachedRecord& record : records_)
+    {
+        kept.records.push_back(record.bytes);
+    }
+    if (!textsKey.empty())
+    {
+        kept.textsKey = textsKey;
+        kept.texts.reserve(records_.size());
+        for (const CachedRecord& record : records_)
+        {
+            kept.texts.push_back(record.description);
+        }
+    }
+    return kept;
 }
 
 void SelCache::erase(BmcCommands& bmc)
@@ -200,6 +276,21 @@ bool SelCache::readAll(BmcCommands& bmc, SelInfo info,
 
 void SelCache::append(const SelRecordBytes& bytes, RecordDescriber& describer)
 {
+    std::string description;
+    try
+    {
+        description = describer.describe(bytes);
+    }
+    catch (const std::exception&)
+    {
+        // A record nothing can interpret keeps its bytes and a plain text.
+        description = fallbackDescription(bytes);
+    }
+    append(bytes, std::move(description));
+}
+
+void SelCache::append(const SelRecordBytes& bytes, std::string description)
+{
     CachedRecord record;
     record.id = recordIdOf(bytes);
     record.bytes = bytes;
@@ -208,15 +299,7 @@ void SelCache::append(const SelRecordBytes& bytes, RecordDescriber& describer)
         const CachedRecord& previous = records_.back();
         record.run = previous.run + (record.id <= previous.id ? 1 : 0);
     }
-    try
-    {
-        record.description = describer.describe(bytes);
-    }
-    catch (const std::exception&)
-    {
-        // A record nothing can interpret keeps its bytes and a plain text.
-        record.description = fallbackDescription(bytes);
-    }
+    record.description = std::move(description);
     records_.push_back(std::move(record));
 }
 

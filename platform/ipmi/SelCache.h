@@ -2,10 +2,12 @@
 
 #include "BmcCommands.h"
 #include "RecordDescriber.h"
+#include "SelCopyFile.h"
 #include "SelReader.h"
 
 #include <chrono>
 #include <cstdint>
+#include <optional>
 #include <string>
 #include <vector>
 
@@ -48,6 +50,13 @@ enum class SelChange
  * interval has passed since the last whole read. Records are told apart
  * by their 16 bytes, never by id or time.
  *
+ * A copy kept from an earlier process (adopt()) stands in for the first
+ * whole read: the first refresh loads it and then checks it with the BMC
+ * exactly as it checks the copy of this process, so an unchanged SEL
+ * costs Get SEL Info and the newest record, added records cost only
+ * themselves, and anything else (a clear, a wrapped ring buffer, another
+ * BMC's SEL) reads the whole SEL again.
+ *
  * Not thread-safe: the caller holds exclusive access to the BMC.
  */
 class SelCache
@@ -71,6 +80,18 @@ class SelCache
     /** Brings the copy up to date. Throws IpmiError; the copy is then
      *  unchanged, or marked for a whole read at the next refresh. */
     SelChange refresh(BmcCommands& bmc, RecordDescriber& describer);
+
+    /** Takes a copy kept by an earlier process; the next refresh uses it
+     *  in place of a whole read, if this cache has read nothing yet. */
+    void adopt(KeptSel kept)
+    {
+        kept_ = std::move(kept);
+    }
+    /** The copy to keep for a later process, its texts under
+     *  @p textsKey (RecordDescriber::textsKey; empty: none): nothing while
+     *  the copy is not known to match the SEL (to be read again next
+     *  time). */
+    std::optional<KeptSel> keep(const std::string& textsKey) const;
 
     /** Clears the SEL, waiting until the BMC has finished. */
     void erase(BmcCommands& bmc);
@@ -108,11 +129,13 @@ class SelCache
     }
 
   private:
+    bool useKept(RecordDescriber& describer);
     bool unchanged(BmcCommands& bmc, const SelInfo& info);
     bool readAdded(BmcCommands& bmc, const SelInfo& info,
                    RecordDescriber& describer);
     bool readAll(BmcCommands& bmc, SelInfo info, RecordDescriber& describer);
     void append(const SelRecordBytes& bytes, RecordDescriber& describer);
+    void append(const SelRecordBytes& bytes, std::string description);
 
     SelReader reader_;
     std::chrono::seconds verifyEvery_;
@@ -123,6 +146,8 @@ class SelCache
     std::uint64_t version_ = 0;
     bool trusted_ = false;
     bool clearSeen_ = false;
+    std::optional<KeptSel> kept_;
+    bool keptUnshown_ = false;
 };
 
 } // namespace QX::Ipmi

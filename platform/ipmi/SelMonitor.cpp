@@ -87,6 +87,18 @@ void SelMonitor::pollLoop(const std::stop_token& stop)
     }
 }
 
+// After a restart the poller starts warm: its first look goes through the
+// source's SEL copy, which the source loaded from its file and had the BMC
+// confirm (records added meanwhile read one by one, anything else read
+// whole), so @p now is the SEL as it truly is without a walk of all of it.
+// The alert state file and the copy file are kept consistent by never
+// depending on each other: the copy is only ever used once the BMC
+// confirmed it, so it holds the true SEL whatever the alert state says,
+// and the alert state alone tells what was announced (its last record is
+// looked up in the true SEL; everything after it is announced). Either
+// file may be newer than the other after a crash between the two writes
+// (the copy is written first, under the source's lock, before the tracker
+// runs): an older alert state only means its records are announced now.
 TrackerResult SelMonitor::track(const SelObservation& now)
 {
     if (tracker_.started())

@@ -268,3 +268,97 @@ TEST_F(SelCacheTest, SensorNamesThatCannotBeReadLeaveTheSel)
 }
 
 } // namespace
+
+namespace
+{
+
+// Fails every Get SEL Entry while asked to: the BMC goes away after
+// Get SEL Info.
+class EntryFailingBmc : public FakeBmc
+{
+  public:
+    bool failEntries = false;
+
+    SelEntry getSelEntry(std::uint16_t reservationId,
+                         std::uint16_t recordId) override
+    {
+        if (failEntries)
+        {
+            throw IpmiError("ipmi_cmd_get_sel_entry",
+                            ErrorCategory::CompletionCode, "timeout",
+                            completionTimedOut);
+        }
+        return FakeBmc::getSelEntry(reservationId, recordId);
+    }
+};
+
+} // namespace
+
+TEST_F(SelCacheTest, AdoptedCopyConfirmedByTheBmcIsNotRead)
+{
+    fill(20);
+    cache.refresh(bmc, describer);
+    const std::optional<KeptSel> kept = cache.keep("");
+    ASSERT_TRUE(kept);
+    EXPECT_EQ(kept->records.size(), 20u);
+    EXPECT_TRUE(kept->texts.empty());
+
+    SelCache next;
+    next.adopt(*kept);
+    bmc.resetCounters();
+    EXPECT_EQ(next.refresh(bmc, describer), SelChange::Replaced);
+    EXPECT_EQ(ids(next), ids(cache));
+    EXPECT_EQ(bmc.selInfoCalls, 1u);
+    EXPECT_EQ(bmc.entryCalls, 1u); // the newest record
+    EXPECT_EQ(next.records()[3].description, "event 4");
+    EXPECT_EQ(next.refresh(bmc, describer), SelChange::None);
+}
+
+TEST_F(SelCacheTest, AdoptedCopyThatNoLongerMatchesIsReadWhole)
+{
+    fill(20);
+    cache.refresh(bmc, describer);
+    const std::optional<KeptSel> kept = cache.keep("");
+    ASSERT_TRUE(kept);
+    // Same count and times, another newest record.
+    bmc.sel.back() = selRecord(99);
+
+    SelCache next;
+    next.adopt(*kept);
+    bmc.resetCounters();
+    EXPECT_EQ(next.refresh(bmc, describer), SelChange::Replaced);
+    EXPECT_EQ(next.records().back().bytes, selRecord(99));
+    EXPECT_GE(bmc.entryCalls, 20u);
+}
+
+TEST_F(SelCacheTest, CopyNotKnownToMatchIsNotKept)
+{
+    EXPECT_FALSE(cache.keep(""));
+    fill(5);
+    cache.refresh(bmc, describer);
+    EXPECT_TRUE(cache.keep(""));
+    cache.invalidate();
+    EXPECT_FALSE(cache.keep(""));
+}
+
+TEST_F(SelCacheTest, AdoptedCopyIsShownAfterARefreshThatFailed)
+{
+    EntryFailingBmc failing;
+    for (std::uint16_t id = 1; id <= 10; ++id)
+    {
+        failing.add(selRecord(id));
+    }
+    cache.refresh(failing, describer);
+    const std::optional<KeptSel> kept = cache.keep("");
+    ASSERT_TRUE(kept);
+
+    SelCache next;
+    next.adopt(*kept);
+    failing.failEntries = true;
+    EXPECT_THROW(next.refresh(failing, describer), IpmiError);
+    failing.failEntries = false;
+    // Whoever shows the copy has not seen its records yet.
+    EXPECT_EQ(next.refresh(failing, describer), SelChange::Replaced);
+    EXPECT_EQ(next.firstNew(), 0u);
+    EXPECT_EQ(ids(next), ids(cache));
+}

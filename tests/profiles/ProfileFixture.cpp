@@ -22,6 +22,11 @@ void ProfileTest::SetUp()
 
 void ProfileTest::TearDown()
 {
+    unload();
+}
+
+void ProfileTest::unload()
+{
     // The host disables indications before it unloads the provider, which
     // ends the monitoring; then the source goes.
     inbox.reset();
@@ -32,21 +37,42 @@ void ProfileTest::TearDown()
 
 void ProfileTest::start(const QX::test::BmcProfile& profile, unsigned timeoutMs)
 {
-    auto ownedBmc = std::make_unique<QX::test::ProfileBmc>(profile);
+    bmcOwner = std::make_shared<QX::test::ProfileBmc>(profile);
+    bmc = bmcOwner.get();
+    timeoutMs_ = timeoutMs;
+    load();
+}
+
+void ProfileTest::load()
+{
     auto ownedDescriber = std::make_unique<QX::test::ProfileDescriber>();
-    bmc = ownedBmc.get();
     describer = ownedDescriber.get();
+    describer->key = textsKey;
     QX::Ipmi::Settings settings;
-    settings.timeoutMs = timeoutMs;
+    settings.timeoutMs = timeoutMs_;
     settings.pollIntervalMs = pollMs;
     settings.clearWaitMs = clearWaitMs;
-    source = std::make_shared<QX::Ipmi::IpmiSource>(std::move(ownedBmc),
-                                                    std::move(ownedDescriber),
-                                                    settings, "Simulated BMC");
+    source = std::make_shared<QX::Ipmi::IpmiSource>(
+        std::make_unique<QX::test::SharedProfileBmc>(bmcOwner),
+        std::move(ownedDescriber), settings, "Simulated BMC", alertStateFile,
+        selCopy);
     QX::Platform::overrideSource(source);
     host_ = std::make_unique<host::Host>(SELPROV_LIBRARY);
     inbox =
         std::make_unique<host::IndicationInbox>(host_->listen("root/zanqx"));
+}
+
+void ProfileTest::restart()
+{
+    unload();
+    describer = nullptr;
+    load();
+}
+
+void ProfileTest::replaceBmc(const QX::test::BmcProfile& profile)
+{
+    bmcOwner = std::make_shared<QX::test::ProfileBmc>(profile);
+    bmc = bmcOwner.get();
 }
 
 std::vector<std::uint16_t> ProfileTest::addRecords(unsigned count)

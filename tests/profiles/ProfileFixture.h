@@ -44,6 +44,12 @@ class ProfileTest : public ::testing::Test
 
     /** Makes the BMC, the IPMI source and loads the provider. */
     void start(const QX::test::BmcProfile& profile, unsigned timeoutMs = 2000);
+    /** Ends the source and the provider as a process exit does, and loads
+     *  them again over the same BMC and the same state files, as a new
+     *  process does. */
+    void restart();
+    /** Puts another BMC of @p profile at the same address (empty SEL). */
+    void replaceBmc(const QX::test::BmcProfile& profile);
     /** Adds @p count records of distinct bodies; returns their ids. */
     std::vector<std::uint16_t> addRecords(unsigned count);
 
@@ -80,7 +86,11 @@ class ProfileTest : public ::testing::Test
         return *source;
     }
 
-    QX::test::ProfileBmc* bmc = nullptr;             // owned by the source
+    void load();
+    void unload();
+
+    std::shared_ptr<QX::test::ProfileBmc> bmcOwner;  // outlives sources
+    QX::test::ProfileBmc* bmc = nullptr;             // bmcOwner
     QX::test::ProfileDescriber* describer = nullptr; // owned by the source
     std::shared_ptr<QX::Ipmi::IpmiSource> source;
     std::unique_ptr<host::Host> host_;
@@ -88,6 +98,12 @@ class ProfileTest : public ::testing::Test
     unsigned pollMs = 50;
     unsigned clearWaitMs = 5000;
     unsigned nextBody = 1;
+    unsigned timeoutMs_ = 2000;
+    /** State files kept across restart(); empty: none. */
+    std::string alertStateFile;
+    QX::Ipmi::SelCopyPlace selCopy;
+    /** The describer's texts key in the next load. */
+    std::string textsKey;
 };
 
 /** Text property of an instance, "" when absent. */

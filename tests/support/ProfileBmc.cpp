@@ -435,6 +435,7 @@ bool ProfileDescriber::refreshSensorNames()
 
 std::string ProfileDescriber::describe(const Ipmi::SelRecordBytes& record)
 {
+    ++described;
     if (record[2] == unreadableType)
     {
         throw std::runtime_error("cannot interpret this record");

@@ -14,6 +14,7 @@
 #include <atomic>
 #include <chrono>
 #include <cstdint>
+#include <memory>
 #include <mutex>
 #include <optional>
 #include <string>
@@ -153,6 +154,59 @@ class ProfileBmc : public Ipmi::BmcCommands
     std::atomic<std::uint64_t> requests_{0};
 };
 
+/** A ProfileBmc seen through the command seam by one source, while the
+ *  BMC itself outlives that source, as a BMC outlives the processes that
+ *  read it. Every call goes to the shared BMC. */
+class SharedProfileBmc : public Ipmi::BmcCommands
+{
+  public:
+    explicit SharedProfileBmc(std::shared_ptr<ProfileBmc> bmc) :
+        bmc_(std::move(bmc))
+    {
+    }
+
+    Ipmi::SelInfo getSelInfo() override
+    {
+        return bmc_->getSelInfo();
+    }
+    std::uint16_t reserveSel() override
+    {
+        return bmc_->reserveSel();
+    }
+    Ipmi::SelEntry getSelEntry(std::uint16_t reservationId,
+                               std::uint16_t recordId) override
+    {
+        return bmc_->getSelEntry(reservationId, recordId);
+    }
+    void initiateSelErase(std::uint16_t reservationId) override
+    {
+        bmc_->initiateSelErase(reservationId);
+    }
+    bool selEraseCompleted(std::uint16_t reservationId) override
+    {
+        return bmc_->selEraseCompleted(reservationId);
+    }
+    std::optional<std::uint8_t> getSystemRestartCause() override
+    {
+        return bmc_->getSystemRestartCause();
+    }
+    std::uint64_t sessionGeneration() const override
+    {
+        return bmc_->sessionGeneration();
+    }
+    std::chrono::steady_clock::time_point lastActivity() const override
+    {
+        return bmc_->lastActivity();
+    }
+    std::uint64_t requestCount() const override
+    {
+        return bmc_->requestCount();
+    }
+
+  private:
+    std::shared_ptr<ProfileBmc> bmc_;
+};
+
 /** A temperature event body whose bytes differ with @p n. */
 Ipmi::SelRecordBytes eventBody(unsigned n);
 /** An "Event Logging Disabled" record body with offset @p offset
@@ -166,9 +220,17 @@ class ProfileDescriber : public Ipmi::RecordDescriber
   public:
     std::atomic<bool> sdrTimesOut{false};
     std::uint8_t unreadableType = 0x55;
+    /** What textsKey() gives; empty: texts are never reused. */
+    std::string key;
+    /** Records described so far. */
+    std::atomic<unsigned> described{0};
 
     bool refreshSensorNames() override;
     std::string describe(const Ipmi::SelRecordBytes& record) override;
+    std::string textsKey() const override
+    {
+        return key;
+    }
 };
 
 } // namespace QX::test
