@@ -85,15 +85,6 @@ BmcProfile frozen()
     return profile;
 }
 
-BmcProfile frozenRing(std::size_t size)
-{
-    BmcProfile profile;
-    profile.capacity = size;
-    profile.ringBuffer = true;
-    profile.frozenTimestamps = true;
-    return profile;
-}
-
 } // namespace
 
 TEST_F(RestartProfilesTest, UnchangedSelIsConfirmedNotRead)
