@@ -10,12 +10,14 @@
 #include <chrono>
 #include <cstdint>
 #include <string>
+#include <string_view>
 
 namespace QX::SELComposite
 {
 
-/** Logger component of the indication code. */
-extern std::string loggerSELIndication;
+/** Logger component of the indication code. A constant, not a string object:
+ * threads still tracing while the library's statics are destroyed read it. */
+inline constexpr std::string_view loggerSELIndication = "Corvane.SELProvider";
 
 /** The namespace indications are delivered into. */
 constexpr const char* INDICATION_NAMESPACE = "root/zanqx";
