@@ -333,11 +333,16 @@ void LogEntryHandler(DateTime time, std::string nodePath)
 
 void LogHandler(DateTime time, std::string nodePath)
 {
+    handleLogAlert(time, std::move(nodePath), &getLogInstrumentation);
+}
+
+void handleLogAlert(DateTime time, std::string nodePath, LogReader read)
+{
     constexpr const char* function = "LogHandler";
     traceEntry(function, __LINE__);
     std::string logPath;
     std::string condition;
-    if (getLogInstrumentation(nodePath, logPath, condition))
+    if (read(nodePath, logPath, condition))
     {
         traceVariable(function, __LINE__, "message", condition.c_str());
         if (_alertSELContextAvailable.load())
