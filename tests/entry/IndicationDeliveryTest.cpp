@@ -368,3 +368,37 @@ TEST_F(IndicationDelivery, ProgressNotesAndDeliveryLinesHaveTheirLevels)
 }
 
 } // namespace
+
+namespace
+{
+
+TEST_F(IndicationDelivery, OnlyTheEntryAndFullEventsNoteBeforeNls)
+{
+    subscribe(clearEvent);
+    subscribe(restartEvent);
+    enable();
+    host::ObjectPath log = classPath("ZAN_MgmtHwLog");
+    log.keys.edit().emplace_back("CreationClassName",
+                                 host::Value::string("ZAN_MgmtHwLog"));
+    log.keys.edit().emplace_back("Name", host::Value::string("IPMI SEL Log"));
+    ASSERT_EQ(host().invokeMethod(log, "ClearLog").rc, CMPI_RC_OK);
+    const auto cleared = next();
+    ASSERT_TRUE(cleared.has_value());
+    EXPECT_EQ(cleared->instance.path.className, clearEvent);
+    source->raiseAlert("/bmc0/wdt", alertTime);
+    const auto restarted = next();
+    ASSERT_TRUE(restarted.has_value());
+    EXPECT_EQ(restarted->instance.path.className, restartEvent);
+    settle();
+    // Both messages were looked up, without the note.
+    EXPECT_FALSE(cleared->instance.property("Message")->text().empty());
+    EXPECT_FALSE(restarted->instance.property("Message")->text().empty());
+    EXPECT_TRUE(linesWith("Before NLS").empty());
+    EXPECT_EQ(linesWith("LogHandler : CB Deliver Indication done").size(), 2u);
+    EXPECT_EQ(linesWith("AutoServerRestartHandler : CB Deliver Indication "
+                        "done")
+                  .size(),
+              2u);
+}
+
+} // namespace
