@@ -37,6 +37,17 @@ class IndicationDelivery : public IndicationTest
     {
         return broker().faults().calls(call);
     }
+
+    /** Calls ClearLog on the log, as a client does. */
+    host::Outcome clearLog()
+    {
+        host::ObjectPath log = classPath("ZAN_MgmtHwLog");
+        log.keys.edit().emplace_back("CreationClassName",
+                                     host::Value::string("ZAN_MgmtHwLog"));
+        log.keys.edit().emplace_back("Name",
+                                     host::Value::string("IPMI SEL Log"));
+        return host().invokeMethod(log, "ClearLog");
+    }
 };
 
 TEST_F(IndicationDelivery, AFailedHardwareReadIsAFailureInTheLog)
@@ -152,11 +163,7 @@ TEST_F(IndicationDelivery, ClearLogBringsTheClearEvent)
 {
     subscribe(clearEvent);
     enable();
-    host::ObjectPath log = classPath("ZAN_MgmtHwLog");
-    log.keys.edit().emplace_back("CreationClassName",
-                                 host::Value::string("ZAN_MgmtHwLog"));
-    log.keys.edit().emplace_back("Name", host::Value::string("IPMI SEL Log"));
-    const host::Outcome cleared = host().invokeMethod(log, "ClearLog");
+    const host::Outcome cleared = clearLog();
     ASSERT_EQ(cleared.rc, CMPI_RC_OK);
     const auto delivered = next();
     ASSERT_TRUE(delivered.has_value());
@@ -367,21 +374,12 @@ TEST_F(IndicationDelivery, ProgressNotesAndDeliveryLinesHaveTheirLevels)
               2u);
 }
 
-} // namespace
-
-namespace
-{
-
 TEST_F(IndicationDelivery, OnlyTheEntryAndFullEventsNoteBeforeNls)
 {
     subscribe(clearEvent);
     subscribe(restartEvent);
     enable();
-    host::ObjectPath log = classPath("ZAN_MgmtHwLog");
-    log.keys.edit().emplace_back("CreationClassName",
-                                 host::Value::string("ZAN_MgmtHwLog"));
-    log.keys.edit().emplace_back("Name", host::Value::string("IPMI SEL Log"));
-    ASSERT_EQ(host().invokeMethod(log, "ClearLog").rc, CMPI_RC_OK);
+    ASSERT_EQ(clearLog().rc, CMPI_RC_OK);
     const auto cleared = next();
     ASSERT_TRUE(cleared.has_value());
     EXPECT_EQ(cleared->instance.path.className, clearEvent);
