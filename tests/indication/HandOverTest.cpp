@@ -116,4 +116,22 @@ TEST(HandOver, AHandlerWaitingForTheRecordGetsItOnceItIsReleased)
     EXPECT_EQ(ticket, second);
 }
 
+TEST(HandOver, TheThreadSideNeverWaits)
+{
+    AlertHandOver handOver;
+    const auto held = handOver.put(DateTime(), "/held");
+    // Another handler waits for the record meanwhile.
+    std::thread waiting([&] { handOver.put(DateTime(), "/next"); });
+    const auto start = Clock::now();
+    for (int i = 0; i < 100; ++i)
+    {
+        const auto taken = handOver.take().second;
+        handOver.delivered(taken);
+    }
+    EXPECT_LT(Clock::now() - start, AlertHandOver::handOverWait / 2);
+    handOver.release(held);
+    waiting.join();
+    EXPECT_EQ(handOver.take().first.nodePath, "/next");
+}
+
 } // namespace
