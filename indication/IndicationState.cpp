@@ -44,7 +44,9 @@ constexpr std::chrono::seconds unloadWait{5};
  * guard (the objects of this unit, defined before it) or has no destructor
  * at all (the logger component names, the atomics of the indication
  * state), so the order in which units are linked does not matter. The
- * platform library, which stays loaded, ends its own threads itself.
+ * platform library, which may stay loaded, ends its own threads itself:
+ * its teardown in platform/Platform.cpp destroys the source, which joins
+ * them.
  */
 struct UnloadGuard
 {
