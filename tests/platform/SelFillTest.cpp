@@ -29,10 +29,7 @@ class SelFillTest : public ::testing::Test
   protected:
     void add(const SelRecordBytes& bytes)
     {
-        CachedRecord record;
-        record.id = static_cast<std::uint16_t>(bytes[0] | bytes[1] << 8);
-        record.bytes = bytes;
-        records.push_back(record);
+        test::appendCached(records, bytes);
         info.entries = static_cast<std::uint16_t>(records.size());
     }
     void addRecords(unsigned count)
