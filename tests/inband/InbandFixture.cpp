@@ -112,6 +112,16 @@ host::Outcome InbandTest::enumerate(const std::string& className)
     return testrequests::enumerate(*host_, className);
 }
 
+host::Outcome InbandTest::loadAndEnumerate(unsigned records,
+                                           const std::string& className)
+{
+    addRecords(records);
+    load();
+    host::Outcome outcome = enumerate(className);
+    EXPECT_EQ(outcome.rc, CMPI_RC_OK) << outcome.message.value_or("");
+    return outcome;
+}
+
 host::Outcome InbandTest::clearLog()
 {
     return testrequests::clearLog(*host_);
@@ -123,9 +133,9 @@ inbandsim::Record temperatureRecord(std::uint8_t reading)
                                      {0x01, 0x30, 0x01, 0x57, reading, 0x50});
 }
 
-std::size_t exchangeWorkers()
+std::set<std::string> exchangeWorkerIds()
 {
-    std::size_t count = 0;
+    std::set<std::string> ids;
     std::error_code error;
     for (const auto& task :
          std::filesystem::directory_iterator("/proc/self/task", error))
@@ -135,10 +145,15 @@ std::size_t exchangeWorkers()
         std::getline(comm, name);
         if (name == QX::Ipmi::ExchangeWorker::threadName)
         {
-            ++count;
+            ids.insert(task.path().filename().string());
         }
     }
-    return count;
+    return ids;
+}
+
+std::size_t exchangeWorkers()
+{
+    return exchangeWorkerIds().size();
 }
 
 std::size_t exchangeWorkersAfterGrace()
