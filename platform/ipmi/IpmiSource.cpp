@@ -312,11 +312,6 @@ void IpmiSource::clearSel()
     cache_.erase(*bmc_);
 }
 
-std::string IpmiSource::printablePath(const std::string& path) const
-{
-    return "IPMI:" + path;
-}
-
 void IpmiSource::startMonitoring(NodeLexicon::NodeType kind,
                                  MonitorCallback callback, const void* context)
 {

@@ -78,7 +78,6 @@ class IpmiSource : public InstrumentationSource
     bool writeProperty(const std::string& path,
                        NodeLexicon::Properties property,
                        unsigned value) override;
-    std::string printablePath(const std::string& path) const override;
     void startMonitoring(NodeLexicon::NodeType kind, MonitorCallback callback,
                          const void* context) override;
     void stopMonitoring(NodeLexicon::NodeType kind, MonitorCallback callback,
