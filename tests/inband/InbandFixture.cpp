@@ -42,16 +42,25 @@ void InbandTest::TearDown()
 
 void InbandTest::load(unsigned timeoutMs, unsigned pollMs)
 {
+    loadWith("ipmi.driver = openipmi\n"
+             "ipmi.driver-device = " +
+             devicePath + "\nipmi.timeout = " + std::to_string(timeoutMs) +
+             "\nipmi.poll-interval = " + std::to_string(pollMs) + "\n");
+}
+
+void InbandTest::loadProbing()
+{
+    loadWith("ipmi.driver = auto\n");
+}
+
+void InbandTest::loadWith(const std::string& settings)
+{
     const std::string file = directory + "/platform.conf";
     {
         std::ofstream out(file);
         out << "source = ipmi\n"
             << "ipmi.interface = inband\n"
-            << "ipmi.driver = openipmi\n"
-            << "ipmi.driver-device = " << devicePath << "\n"
-            << "ipmi.timeout = " << timeoutMs << "\n"
-            << "ipmi.poll-interval = " << pollMs << "\n"
-            << "ipmi.state-directory = " << directory << "/state\n"
+            << settings << "ipmi.state-directory = " << directory << "/state\n"
             << "log.sink = none\n";
     }
     ASSERT_EQ(

@@ -31,6 +31,9 @@ class InbandTest : public ::testing::Test
 
     /** Writes the configuration and loads the provider. */
     void load(unsigned timeoutMs = 1000, unsigned pollMs = 150);
+    /** Loads the provider on a platform that probes for an in-band BMC
+     *  itself, as an installed one does. */
+    void loadProbing();
     /** Unloads the provider as an object manager does, then ends the
      *  platform's source, as unloading the platform library does. */
     void unload();
@@ -62,6 +65,9 @@ class InbandTest : public ::testing::Test
     std::string devicePath;
 
   private:
+    /** Writes @p settings as the configuration and loads the provider. */
+    void loadWith(const std::string& settings);
+
     std::unique_ptr<inbandsim::IpmiDevice> device_;
     std::unique_ptr<host::Host> host_;
 };
