@@ -23,6 +23,7 @@
 #include "Host.h"
 #include "MemorySource.h"
 #include "Platform.h"
+#include "SelClasses.h"
 
 #include <functional>
 #include <sstream>
@@ -129,7 +130,7 @@ void onGeneratedLog(benchmark::State& state, const Run& run)
     const auto entries = static_cast<unsigned>(state.range(0));
     useGeneratedLog(entries);
     {
-        host::Host host(SELPROV_LIBRARY);
+        host::Host host(selclasses::hostOptions(SELPROV_LIBRARY));
         run(host, entries);
     }
     QX::Platform::overrideSource(nullptr);

@@ -37,7 +37,9 @@ class Broker
     // Number of distinct CMPIBroker pointers the broker can hand out.
     static constexpr std::size_t viewCount = 3;
 
-    explicit Broker(Schema schema = selSchema());
+    // @p schema: the classes whose instance paths the broker builds from
+    // their key properties.
+    explicit Broker(Schema schema = {});
     ~Broker();
     Broker(const Broker&) = delete;
     Broker& operator=(const Broker&) = delete;
