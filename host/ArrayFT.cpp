@@ -7,21 +7,6 @@ namespace host::detail
 namespace
 {
 
-CMPIStatus arrayRelease(CMPIArray* ar)
-{
-    return releaseObject<ArrayObject>(ar);
-}
-
-CMPIArray* arrayClone(const CMPIArray* ar, CMPIStatus* rc)
-{
-    return cloneObject<ArrayObject>(ar, rc,
-                                    [](auto& to, const auto& from)
-                                    {
-                                        to.elementType = from.elementType;
-                                        to.elements = from.elements;
-                                    });
-}
-
 CMPICount arrayGetSize(const CMPIArray* ar, CMPIStatus* rc)
 {
     const ArrayObject* a = ArrayObject::of(ar);
@@ -83,8 +68,8 @@ CMPIStatus arraySetElementAt(CMPIArray* ar, CMPICount index,
 
 CMPIArrayFT arrayFT = {
     200,
-    arrayRelease,
-    arrayClone,
+    releaseObject<ArrayObject, CMPIArray>,
+    cloneObject<ArrayObject, CMPIArray>,
     arrayGetSize,
     arrayGetSimpleType,
     arrayGetElementAt,

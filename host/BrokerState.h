@@ -167,9 +167,9 @@ CMPIStatus releaseObject(Handle* handle)
 }
 
 // clone() of every object table: a new broker-owned object of the same
-// type whose own state @p copyState copies over.
-template <typename Object, typename Handle, typename CopyState>
-Handle* cloneObject(const Handle* handle, CMPIStatus* rc, CopyState copyState)
+// type with the state of the original.
+template <typename Object, typename Handle>
+Handle* cloneObject(const Handle* handle, CMPIStatus* rc)
 {
     const Object* object = Object::of(handle);
     if (object == nullptr)
@@ -178,7 +178,7 @@ Handle* cloneObject(const Handle* handle, CMPIStatus* rc, CopyState copyState)
         return nullptr;
     }
     auto* copy = object->broker->template makeOwned<Object>(Ownership::Clone);
-    copyState(*copy, *object);
+    copy->copyFrom(*object);
     setStatus(rc, CMPI_RC_OK);
     return &copy->cmpi;
 }

@@ -7,17 +7,6 @@ namespace host::detail
 namespace
 {
 
-CMPIStatus dateTimeRelease(CMPIDateTime* dt)
-{
-    return releaseObject<DateTimeObject>(dt);
-}
-
-CMPIDateTime* dateTimeClone(const CMPIDateTime* dt, CMPIStatus* rc)
-{
-    return cloneObject<DateTimeObject>(
-        dt, rc, [](auto& to, const auto& from) { to.text = from.text; });
-}
-
 CMPIUint64 dateTimeGetBinaryFormat(const CMPIDateTime* dt, CMPIStatus* rc)
 {
     const DateTimeObject* d = DateTimeObject::of(dt);
@@ -61,8 +50,8 @@ CMPIBoolean dateTimeIsInterval(const CMPIDateTime* dt, CMPIStatus* rc)
 
 CMPIDateTimeFT dateTimeFT = {
     200,
-    dateTimeRelease,
-    dateTimeClone,
+    releaseObject<DateTimeObject, CMPIDateTime>,
+    cloneObject<DateTimeObject, CMPIDateTime>,
     dateTimeGetBinaryFormat,
     dateTimeGetStringFormat,
     dateTimeIsInterval,

@@ -63,23 +63,6 @@ namespace
 
 using Inst = InstanceObject;
 
-CMPIStatus instRelease(CMPIInstance* inst)
-{
-    return releaseObject<Inst>(inst);
-}
-
-CMPIInstance* instClone(const CMPIInstance* inst, CMPIStatus* rc)
-{
-    return cloneObject<Inst>(inst, rc,
-                             [](auto& to, const auto& from)
-                             {
-                                 to.path = from.path;
-                                 to.properties = from.properties;
-                                 to.filter = from.filter;
-                                 to.filterKeys = from.filterKeys;
-                             });
-}
-
 CMPIData instGetProperty(const CMPIInstance* inst, const char* name,
                          CMPIStatus* rc)
 {
@@ -208,8 +191,8 @@ CMPIStatus instSetObjectPath(CMPIInstance* inst, const CMPIObjectPath* op)
 // setPropertyWithOrigin stays NULL, as in SFCB.
 CMPIInstanceFT instanceFT = {
     200,
-    instRelease,
-    instClone,
+    releaseObject<Inst, CMPIInstance>,
+    cloneObject<Inst, CMPIInstance>,
     instGetProperty,
     instGetPropertyAt,
     instGetPropertyCount,

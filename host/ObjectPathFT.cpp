@@ -9,17 +9,6 @@ namespace
 
 using Op = ObjectPathObject;
 
-CMPIStatus opRelease(CMPIObjectPath* op)
-{
-    return releaseObject<Op>(op);
-}
-
-CMPIObjectPath* opClone(const CMPIObjectPath* op, CMPIStatus* rc)
-{
-    return cloneObject<Op>(
-        op, rc, [](auto& to, const auto& from) { to.path = from.path; });
-}
-
 CMPIStatus setText(CMPIObjectPath* op, const char* text,
                    Text ObjectPath::*member)
 {
@@ -243,8 +232,8 @@ CMPIString* opToString(const CMPIObjectPath* op, CMPIStatus* rc)
 
 CMPIObjectPathFT objectPathFT = {
     200,
-    opRelease,
-    opClone,
+    releaseObject<Op, CMPIObjectPath>,
+    cloneObject<Op, CMPIObjectPath>,
     opSetNameSpace,
     opGetNameSpace,
     opSetHostname,

@@ -48,7 +48,8 @@ struct Object
     Ownership ownership = Ownership::Arena;
 };
 
-// Binds the embedded CMPI struct to its object and function table.
+// Binds the embedded CMPI struct to its object and function table. Each
+// object also has copyFrom(other), which copies its own state for clone().
 template <typename C, typename FT, FT* table>
 struct Encapsulated : Object
 {
@@ -80,6 +81,11 @@ struct StringObject : Encapsulated<CMPIString, CMPIStringFT, &stringFT>
         return from<StringObject>(s);
     }
     std::optional<std::string> text;
+
+    void copyFrom(const StringObject& other)
+    {
+        text = other.text;
+    }
 };
 
 struct ArrayObject : Encapsulated<CMPIArray, CMPIArrayFT, &arrayFT>
@@ -91,6 +97,12 @@ struct ArrayObject : Encapsulated<CMPIArray, CMPIArrayFT, &arrayFT>
     }
     CMPIType elementType = CMPI_null; // never CMPI_chars
     std::vector<Value> elements;
+
+    void copyFrom(const ArrayObject& other)
+    {
+        elementType = other.elementType;
+        elements = other.elements;
+    }
 };
 
 struct DateTimeObject : Encapsulated<CMPIDateTime, CMPIDateTimeFT, &dateTimeFT>
@@ -101,6 +113,11 @@ struct DateTimeObject : Encapsulated<CMPIDateTime, CMPIDateTimeFT, &dateTimeFT>
         return from<DateTimeObject>(d);
     }
     Text text; // CIM datetime text
+
+    void copyFrom(const DateTimeObject& other)
+    {
+        text = other.text;
+    }
 };
 
 struct ObjectPathObject :
@@ -112,6 +129,11 @@ struct ObjectPathObject :
         return from<ObjectPathObject>(p);
     }
     ObjectPath path;
+
+    void copyFrom(const ObjectPathObject& other)
+    {
+        path = other.path;
+    }
 };
 
 struct InstanceObject : Encapsulated<CMPIInstance, CMPIInstanceFT, &instanceFT>
@@ -131,6 +153,13 @@ struct InstanceObject : Encapsulated<CMPIInstance, CMPIInstanceFT, &instanceFT>
     // the key properties set on the instance, in the class's key order.
     ObjectPath effectivePath() const;
     Instance snapshot() const;
+    void copyFrom(const InstanceObject& other)
+    {
+        path = other.path;
+        properties = other.properties;
+        filter = other.filter;
+        filterKeys = other.filterKeys;
+    }
 };
 
 struct ResultObject : Encapsulated<CMPIResult, CMPIResultFT, &resultFT>
@@ -154,6 +183,11 @@ struct ContextObject : Encapsulated<CMPIContext, CMPIContextFT, &contextFT>
         return from<ContextObject>(c);
     }
     NamedValues entries; // names compare exactly
+
+    void copyFrom(const ContextObject& other)
+    {
+        entries = other.entries;
+    }
 };
 
 struct ArgsObject : Encapsulated<CMPIArgs, CMPIArgsFT, &argsFT>
@@ -164,6 +198,11 @@ struct ArgsObject : Encapsulated<CMPIArgs, CMPIArgsFT, &argsFT>
         return from<ArgsObject>(a);
     }
     NamedValues args;
+
+    void copyFrom(const ArgsObject& other)
+    {
+        args = other.args;
+    }
 };
 
 // The filter an object manager hands to an indication MI: the query and
@@ -178,6 +217,12 @@ struct SelectExpObject :
     }
     std::string query;
     std::string language;
+
+    void copyFrom(const SelectExpObject& other)
+    {
+        query = other.query;
+        language = other.language;
+    }
 };
 
 // Owns broker objects until it is cleared or destroyed. Thread-safe.

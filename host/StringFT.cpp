@@ -6,17 +6,6 @@ namespace host::detail
 namespace
 {
 
-CMPIStatus stringRelease(CMPIString* st)
-{
-    return releaseObject<StringObject>(st);
-}
-
-CMPIString* stringClone(const CMPIString* st, CMPIStatus* rc)
-{
-    return cloneObject<StringObject>(
-        st, rc, [](auto& to, const auto& from) { to.text = from.text; });
-}
-
 const char* stringGetCharPtr(const CMPIString* st, CMPIStatus* rc)
 {
     const StringObject* s = StringObject::of(st);
@@ -39,8 +28,8 @@ const char* stringGetCharPtr(const CMPIString* st, CMPIStatus* rc)
 
 CMPIStringFT stringFT = {
     200,
-    stringRelease,
-    stringClone,
+    releaseObject<StringObject, CMPIString>,
+    cloneObject<StringObject, CMPIString>,
     stringGetCharPtr,
 };
 
