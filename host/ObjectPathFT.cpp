@@ -10,7 +10,7 @@ namespace
 using Op = ObjectPathObject;
 
 CMPIStatus setText(CMPIObjectPath* op, const char* text,
-                   Text ObjectPath::*member)
+                   std::string ObjectPath::*member)
 {
     Op* p = Op::of(op);
     if (p == nullptr)
@@ -28,7 +28,8 @@ CMPIStatus setText(CMPIObjectPath* op, const char* text,
 // getNameSpace, getHostname, getClassName: a new string, with the faults
 // planned for the call (if any).
 CMPIString* getText(const CMPIObjectPath* op, CMPIStatus* rc,
-                    Text ObjectPath::*member, std::optional<BrokerCall> call)
+                    std::string ObjectPath::*member,
+                    std::optional<BrokerCall> call)
 {
     const Op* p = Op::of(op);
     if (p == nullptr)
