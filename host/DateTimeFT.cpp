@@ -43,7 +43,7 @@ CMPIBoolean dateTimeIsInterval(const CMPIDateTime* dt, CMPIStatus* rc)
         return 0;
     }
     setStatus(rc, CMPI_RC_OK);
-    return d->text.size() > 21 && d->text[21] == ':';
+    return d->text.size() > 21 && d->text.view()[21] == ':';
 }
 
 } // namespace

@@ -10,7 +10,7 @@ namespace
 using Op = ObjectPathObject;
 
 CMPIStatus setText(CMPIObjectPath* op, const char* text,
-                   std::string ObjectPath::*member)
+                   Text ObjectPath::*member)
 {
     Op* p = Op::of(op);
     if (p == nullptr)
@@ -28,8 +28,7 @@ CMPIStatus setText(CMPIObjectPath* op, const char* text,
 // getNameSpace, getHostname, getClassName: a new string, with the faults
 // planned for the call (if any).
 CMPIString* getText(const CMPIObjectPath* op, CMPIStatus* rc,
-                    std::string ObjectPath::*member,
-                    std::optional<BrokerCall> call)
+                    Text ObjectPath::*member, std::optional<BrokerCall> call)
 {
     const Op* p = Op::of(op);
     if (p == nullptr)

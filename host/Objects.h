@@ -111,7 +111,7 @@ struct DateTimeObject : Encapsulated<CMPIDateTime, CMPIDateTimeFT, &dateTimeFT>
     {
         return from<DateTimeObject>(d);
     }
-    std::string text; // CIM datetime text
+    Text text; // CIM datetime text
 
     void copyFrom(const DateTimeObject& other)
     {

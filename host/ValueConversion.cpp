@@ -68,7 +68,7 @@ CMPIrc readScalar(const CMPIValue& v, CMPIType type, Value& out)
                 return CMPI_RC_ERR_INVALID_HANDLE;
             }
             out.null = !s->text.has_value();
-            out.setText(s->text.value_or(std::string()));
+            out.setText(s->text ? Text(*s->text) : Text());
             return CMPI_RC_OK;
         }
         case CMPI_dateTime:

@@ -49,7 +49,7 @@ Value Value::real(CMPIType type, double value)
     return v;
 }
 
-Value Value::string(std::string value)
+Value Value::string(Text value)
 {
     Value v;
     v.type = CMPI_string;
@@ -57,7 +57,7 @@ Value Value::string(std::string value)
     return v;
 }
 
-Value Value::dateTime(std::string cimText)
+Value Value::dateTime(Text cimText)
 {
     Value v;
     v.type = CMPI_dateTime;
@@ -118,7 +118,7 @@ double Value::realValue() const
 
 std::string_view Value::text() const
 {
-    return objectOf<std::string>(payload_);
+    return objectOf<Text>(payload_);
 }
 
 const std::vector<Value>& Value::elements() const
@@ -227,7 +227,7 @@ const Value* findNamed(const NamedValues& values, std::string_view name)
     return nullptr;
 }
 
-void setNamed(NamedValues& values, std::string name, Value value)
+void setNamed(NamedValues& values, Text name, Value value)
 {
     for (auto& [n, v] : values)
     {
@@ -315,7 +315,7 @@ const Value* ObjectPath::key(std::string_view name) const
     return findNamed(keys.list(), name);
 }
 
-void ObjectPath::setKey(std::string name, Value value)
+void ObjectPath::setKey(Text name, Value value)
 {
     setNamed(keys.edit(), std::move(name), std::move(value));
 }
@@ -331,7 +331,7 @@ const Value* Instance::property(std::string_view name) const
     return findNamed(properties.list(), name);
 }
 
-void Instance::setProperty(std::string name, Value value)
+void Instance::setProperty(Text name, Value value)
 {
     setNamed(properties.edit(), std::move(name), std::move(value));
 }

@@ -1,5 +1,7 @@
 #pragma once
 
+#include "Text.h"
+
 #include <cmpidt.h>
 
 #include <atomic>
@@ -47,7 +49,7 @@ struct Value
     {
         payload_ = value;
     }
-    void setText(std::string value)
+    void setText(Text value)
     {
         payload_ = std::move(value);
     }
@@ -73,23 +75,23 @@ struct Value
     static Value unsignedInt(CMPIType type, std::uint64_t value);
     static Value signedInt(CMPIType type, std::int64_t value);
     static Value real(CMPIType type, double value);
-    static Value string(std::string value);
-    static Value dateTime(std::string cimText);
+    static Value string(Text value);
+    static Value dateTime(Text cimText);
     static Value reference(ObjectPath path);
     static Value array(CMPIType elementType, std::vector<Value> elements);
 
   private:
-    std::variant<std::monostate, std::uint64_t, std::int64_t, double,
-                 std::string, std::vector<Value>, std::shared_ptr<ObjectPath>>
+    std::variant<std::monostate, std::uint64_t, std::int64_t, double, Text,
+                 std::vector<Value>, std::shared_ptr<ObjectPath>>
         payload_;
 };
 
-using NamedValues = std::vector<std::pair<std::string, Value>>;
+using NamedValues = std::vector<std::pair<Text, Value>>;
 
 // Case-insensitive lookup in a list of named values; nullptr if absent.
 const Value* findNamed(const NamedValues& values, std::string_view name);
 // Replaces a value of the same name in place, or appends a new one.
-void setNamed(NamedValues& values, std::string name, Value value);
+void setNamed(NamedValues& values, Text name, Value value);
 
 // A list of named values that copies share until one of them changes it.
 // The instance a provider builds and every copy the broker takes of it (a
@@ -153,13 +155,13 @@ class SharedNamedValues
 
 struct ObjectPath
 {
-    std::string nameSpace;
-    std::string className;
-    std::string host;
+    Text nameSpace;
+    Text className;
+    Text host;
     SharedNamedValues keys; // in insertion order
 
     const Value* key(std::string_view name) const;
-    void setKey(std::string name, Value value);
+    void setKey(Text name, Value value);
     // WBEM text: [//host/]ns:Class.K1="v1",K2=7 with keys sorted by name.
     std::string toString() const;
     // Throws std::invalid_argument on malformed text. With a schema, keys
@@ -174,7 +176,7 @@ struct Instance
     ObjectPath path;              // as the broker's getObjectPath returns it
     SharedNamedValues properties; // in the order first set
     const Value* property(std::string_view name) const;
-    void setProperty(std::string name, Value value);
+    void setProperty(Text name, Value value);
     std::vector<std::string> propertyNames() const;
 };
 

@@ -81,7 +81,7 @@ std::vector<std::string> propertyMismatches(const mof::ClassRepository& classes,
                                             const host::Instance& instance)
 {
     std::vector<std::string> problems;
-    const std::string className = instance.path.className;
+    const std::string className = instance.path.className.str();
     for (const auto& [name, value] : instance.properties)
     {
         const mof::Class* declaredIn = nullptr;

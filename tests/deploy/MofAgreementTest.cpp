@@ -167,7 +167,7 @@ TEST(IndicationAgreement, EveryIndicationClassHasItsIndication)
     std::set<std::string> classes;
     for (const host::Instance& i : deploy::expectedIndications())
     {
-        classes.insert(i.path.className);
+        classes.insert(i.path.className.str());
     }
     const std::vector<std::string> delivered(classes.begin(), classes.end());
     EXPECT_THAT(delivered,

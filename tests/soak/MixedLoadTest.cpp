@@ -295,14 +295,14 @@ void MixedLoad::checkPhase(
         {
             problems.add("malformed indication: " + wrong);
         }
-        else if (allowed.count(indication.instance.path.className) == 0)
+        else if (allowed.count(indication.instance.path.className.str()) == 0)
         {
             problems.add(indication.instance.path.className +
                          " delivered while its node kind was not watched");
         }
         else
         {
-            deliveredClasses.insert(indication.instance.path.className);
+            deliveredClasses.insert(indication.instance.path.className.str());
         }
     }
 }

@@ -82,7 +82,7 @@ std::string textOf(const host::Instance& instance, const char* name)
 std::string malformation(const host::DeliveredIndication& indication)
 {
     const host::Instance& instance = indication.instance;
-    const std::string className = instance.path.className;
+    const std::string className = instance.path.className.str();
     if (indication.nameSpace != nameSpace)
     {
         return "delivered into " + indication.nameSpace;
