@@ -4,6 +4,12 @@
 
 namespace host::detail
 {
+
+void ArgsObject::copyFrom(const ArgsObject& other)
+{
+    args = other.args;
+}
+
 namespace
 {
 

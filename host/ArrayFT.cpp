@@ -4,6 +4,13 @@
 
 namespace host::detail
 {
+
+void ArrayObject::copyFrom(const ArrayObject& other)
+{
+    elementType = other.elementType;
+    elements = other.elements;
+}
+
 namespace
 {
 

@@ -6,6 +6,12 @@
 
 namespace host::detail
 {
+
+void ContextObject::copyFrom(const ContextObject& other)
+{
+    entries = other.entries;
+}
+
 namespace
 {
 

@@ -4,6 +4,12 @@
 
 namespace host::detail
 {
+
+void DateTimeObject::copyFrom(const DateTimeObject& other)
+{
+    text = other.text;
+}
+
 namespace
 {
 

@@ -8,6 +8,14 @@
 namespace host::detail
 {
 
+void InstanceObject::copyFrom(const InstanceObject& other)
+{
+    path = other.path;
+    properties = other.properties;
+    filter = other.filter;
+    filterKeys = other.filterKeys;
+}
+
 bool InstanceObject::accepts(std::string_view name) const
 {
     if (!filter)

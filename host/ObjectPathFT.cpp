@@ -4,6 +4,12 @@
 
 namespace host::detail
 {
+
+void ObjectPathObject::copyFrom(const ObjectPathObject& other)
+{
+    path = other.path;
+}
+
 namespace
 {
 

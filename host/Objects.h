@@ -81,10 +81,7 @@ struct StringObject : Encapsulated<CMPIString, CMPIStringFT, &stringFT>
     }
     std::optional<std::string> text;
 
-    void copyFrom(const StringObject& other)
-    {
-        text = other.text;
-    }
+    void copyFrom(const StringObject& other);
 };
 
 struct ArrayObject : Encapsulated<CMPIArray, CMPIArrayFT, &arrayFT>
@@ -97,11 +94,7 @@ struct ArrayObject : Encapsulated<CMPIArray, CMPIArrayFT, &arrayFT>
     CMPIType elementType = CMPI_null; // never CMPI_chars
     std::vector<Value> elements;
 
-    void copyFrom(const ArrayObject& other)
-    {
-        elementType = other.elementType;
-        elements = other.elements;
-    }
+    void copyFrom(const ArrayObject& other);
 };
 
 struct DateTimeObject : Encapsulated<CMPIDateTime, CMPIDateTimeFT, &dateTimeFT>
@@ -113,10 +106,7 @@ struct DateTimeObject : Encapsulated<CMPIDateTime, CMPIDateTimeFT, &dateTimeFT>
     }
     Text text; // CIM datetime text
 
-    void copyFrom(const DateTimeObject& other)
-    {
-        text = other.text;
-    }
+    void copyFrom(const DateTimeObject& other);
 };
 
 struct ObjectPathObject :
@@ -129,10 +119,7 @@ struct ObjectPathObject :
     }
     ObjectPath path;
 
-    void copyFrom(const ObjectPathObject& other)
-    {
-        path = other.path;
-    }
+    void copyFrom(const ObjectPathObject& other);
 };
 
 struct InstanceObject : Encapsulated<CMPIInstance, CMPIInstanceFT, &instanceFT>
@@ -152,13 +139,7 @@ struct InstanceObject : Encapsulated<CMPIInstance, CMPIInstanceFT, &instanceFT>
     // the key properties set on the instance, in the class's key order.
     ObjectPath effectivePath() const;
     Instance snapshot() const;
-    void copyFrom(const InstanceObject& other)
-    {
-        path = other.path;
-        properties = other.properties;
-        filter = other.filter;
-        filterKeys = other.filterKeys;
-    }
+    void copyFrom(const InstanceObject& other);
 };
 
 struct ResultObject : Encapsulated<CMPIResult, CMPIResultFT, &resultFT>
@@ -183,10 +164,7 @@ struct ContextObject : Encapsulated<CMPIContext, CMPIContextFT, &contextFT>
     }
     NamedValues entries; // names compare exactly
 
-    void copyFrom(const ContextObject& other)
-    {
-        entries = other.entries;
-    }
+    void copyFrom(const ContextObject& other);
 };
 
 struct ArgsObject : Encapsulated<CMPIArgs, CMPIArgsFT, &argsFT>
@@ -198,10 +176,7 @@ struct ArgsObject : Encapsulated<CMPIArgs, CMPIArgsFT, &argsFT>
     }
     NamedValues args;
 
-    void copyFrom(const ArgsObject& other)
-    {
-        args = other.args;
-    }
+    void copyFrom(const ArgsObject& other);
 };
 
 // The filter an object manager hands to an indication MI: the query and
@@ -217,11 +192,7 @@ struct SelectExpObject :
     std::string query;
     std::string language;
 
-    void copyFrom(const SelectExpObject& other)
-    {
-        query = other.query;
-        language = other.language;
-    }
+    void copyFrom(const SelectExpObject& other);
 };
 
 // Owns the broker objects made in one scope (a request, a thread attached

@@ -6,6 +6,13 @@
 
 namespace host::detail
 {
+
+void SelectExpObject::copyFrom(const SelectExpObject& other)
+{
+    query = other.query;
+    language = other.language;
+}
+
 namespace
 {
 

@@ -3,6 +3,12 @@
 
 namespace host::detail
 {
+
+void StringObject::copyFrom(const StringObject& other)
+{
+    text = other.text;
+}
+
 namespace
 {
 
