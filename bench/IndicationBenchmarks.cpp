@@ -7,6 +7,7 @@
 #include "MemorySource.h"
 #include "NodeTree.h"
 #include "Platform.h"
+#include "SelClasses.h"
 
 #include <algorithm>
 #include <chrono>
@@ -41,10 +42,9 @@ void BM_AlertToDeliveredIndication(benchmark::State& state)
     QX::Platform::overrideSource(source);
     std::vector<double> micros;
     {
-        host::Host host(SELPROV_LIBRARY);
+        host::Host host(selclasses::hostOptions(SELPROV_LIBRARY));
         host::IndicationInbox inbox = host.listen("root/zanqx");
-        const auto filter =
-            host::IndicationFilter::forClass("ZAN_MgmtHwLogEntryEvent");
+        const auto filter = selclasses::filterFor("ZAN_MgmtHwLogEntryEvent");
         host.activateFilter(filter, true);
         host.enableIndications();
         const std::string entry = QX::MemorySource::entryPath("/bmc0/sel", 1);

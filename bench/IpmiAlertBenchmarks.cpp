@@ -14,6 +14,7 @@
 #include "Host.h"
 #include "IndicationInbox.h"
 #include "Platform.h"
+#include "SelClasses.h"
 #include "SimulatedBmc.h"
 #include "ipmi/IpmiSource.h"
 #include "ipmi/IpmiSourceFactory.h"
@@ -75,10 +76,9 @@ void BM_RecordAddedToDeliveredIndication(benchmark::State& state)
     std::vector<double> delaysMs;
     double requestsPerIdlePoll = 0;
     {
-        host::Host host(SELPROV_LIBRARY);
+        host::Host host(selclasses::hostOptions(SELPROV_LIBRARY));
         host::IndicationInbox inbox = host.listen("root/zanqx");
-        const auto filter =
-            host::IndicationFilter::forClass("ZAN_MgmtHwLogEntryEvent");
+        const auto filter = selclasses::filterFor("ZAN_MgmtHwLogEntryEvent");
         host.authorizeFilter(filter, "root");
         host.mustPoll(filter);
         host.activateFilter(filter, true);

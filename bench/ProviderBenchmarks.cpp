@@ -8,6 +8,7 @@
 #include "MemorySource.h"
 #include "Platform.h"
 #include "SEL.h"
+#include "SelClasses.h"
 
 #include <sstream>
 
@@ -71,7 +72,7 @@ BENCHMARK(BM_GatherEntries)
 void BM_EnumerateEntryInstances(benchmark::State& state)
 {
     useGenerated(static_cast<unsigned>(state.range(0)));
-    host::Host host(SELPROV_LIBRARY);
+    host::Host host(selclasses::hostOptions(SELPROV_LIBRARY));
     host::ObjectPath reference;
     reference.nameSpace = "root/zanqx";
     reference.className = "ZAN_MgmtHwLogEntry";
@@ -91,7 +92,7 @@ BENCHMARK(BM_EnumerateEntryInstances)
 void BM_GetOneEntry(benchmark::State& state)
 {
     useGenerated(static_cast<unsigned>(state.range(0)));
-    host::Host host(SELPROV_LIBRARY);
+    host::Host host(selclasses::hostOptions(SELPROV_LIBRARY));
     host::ObjectPath reference;
     reference.nameSpace = "root/zanqx";
     reference.className = "ZAN_MgmtHwLogEntry";

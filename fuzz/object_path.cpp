@@ -2,6 +2,7 @@
 // provider's schema. A path that parses prints as text that parses again
 // to the same text.
 #include "Schema.h"
+#include "SelClasses.h"
 #include "Values.h"
 
 #include <cstdint>
@@ -13,7 +14,7 @@
 extern "C" int LLVMFuzzerTestOneInput(const std::uint8_t* data,
                                       std::size_t size)
 {
-    static const host::Schema schema = host::selSchema();
+    static const host::Schema schema = selclasses::schema();
     if (size == 0)
     {
         return 0;

@@ -4,19 +4,14 @@
 
 namespace host::detail
 {
+
+void ArgsObject::copyFrom(const ArgsObject& other)
+{
+    args = other.args;
+}
+
 namespace
 {
-
-CMPIStatus argsRelease(CMPIArgs* as)
-{
-    return releaseObject<ArgsObject>(as);
-}
-
-CMPIArgs* argsClone(const CMPIArgs* as, CMPIStatus* rc)
-{
-    return cloneObject<ArgsObject>(
-        as, rc, [](auto& to, const auto& from) { to.args = from.args; });
-}
 
 CMPIStatus argsAddArg(const CMPIArgs* as, const char* name,
                       const CMPIValue* value, const CMPIType type)
@@ -70,8 +65,13 @@ CMPICount argsGetArgCount(const CMPIArgs* as, CMPIStatus* rc)
 } // namespace
 
 CMPIArgsFT argsFT = {
-    200,        argsRelease,  argsClone,       argsAddArg,
-    argsGetArg, argsGetArgAt, argsGetArgCount,
+    200,
+    releaseObject<ArgsObject, CMPIArgs>,
+    cloneObject<ArgsObject, CMPIArgs>,
+    argsAddArg,
+    argsGetArg,
+    argsGetArgAt,
+    argsGetArgCount,
 };
 
 } // namespace host::detail

@@ -4,23 +4,15 @@
 
 namespace host::detail
 {
+
+void ArrayObject::copyFrom(const ArrayObject& other)
+{
+    elementType = other.elementType;
+    elements = other.elements;
+}
+
 namespace
 {
-
-CMPIStatus arrayRelease(CMPIArray* ar)
-{
-    return releaseObject<ArrayObject>(ar);
-}
-
-CMPIArray* arrayClone(const CMPIArray* ar, CMPIStatus* rc)
-{
-    return cloneObject<ArrayObject>(ar, rc,
-                                    [](auto& to, const auto& from)
-                                    {
-                                        to.elementType = from.elementType;
-                                        to.elements = from.elements;
-                                    });
-}
 
 CMPICount arrayGetSize(const CMPIArray* ar, CMPIStatus* rc)
 {
@@ -83,8 +75,8 @@ CMPIStatus arraySetElementAt(CMPIArray* ar, CMPICount index,
 
 CMPIArrayFT arrayFT = {
     200,
-    arrayRelease,
-    arrayClone,
+    releaseObject<ArrayObject, CMPIArray>,
+    cloneObject<ArrayObject, CMPIArray>,
     arrayGetSize,
     arrayGetSimpleType,
     arrayGetElementAt,

@@ -121,18 +121,13 @@ std::size_t Broker::outstandingPreparedContexts() const
 
 std::size_t Broker::brokerOwnedObjects() const
 {
-    return state_->brokerArena.size();
-}
-
-std::size_t Broker::cachedArenaBytes() const
-{
-    return state_->arenaBlocks.cachedBytes();
+    return state_->brokerObjects.size();
 }
 
 Broker::Request::Request(Broker& broker) :
-    state_(*broker.state_), arena_(std::make_unique<Arena>(&state_.arenaBlocks))
+    state_(*broker.state_), objects_(std::make_unique<OwnedObjects>())
 {
-    state_.pushScope(arena_.get(), nullptr);
+    state_.pushScope(objects_.get(), nullptr);
     context_ = state_.make<ContextObject>();
     context_->entries.emplace_back(CMPIInvocationFlags,
                                    Value::unsignedInt(CMPI_uint32, 0));
@@ -143,8 +138,8 @@ Broker::Request::Request(Broker& broker) :
 
 Broker::Request::~Request()
 {
-    state_.popScope(arena_.get());
-    arena_->clear();
+    state_.popScope(objects_.get());
+    objects_->clear();
 }
 
 const CMPIContext* Broker::Request::context() const

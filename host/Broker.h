@@ -20,7 +20,7 @@ namespace host
 namespace detail
 {
 struct BrokerState;
-class Arena;
+class OwnedObjects;
 struct ContextObject;
 struct ResultObject;
 } // namespace detail
@@ -37,7 +37,9 @@ class Broker
     // Number of distinct CMPIBroker pointers the broker can hand out.
     static constexpr std::size_t viewCount = 3;
 
-    explicit Broker(Schema schema = selSchema());
+    // @p schema: the classes whose instance paths the broker builds from
+    // their key properties.
+    explicit Broker(Schema schema = {});
     ~Broker();
     Broker(const Broker&) = delete;
     Broker& operator=(const Broker&) = delete;
@@ -71,8 +73,6 @@ class Broker
     std::size_t outstandingPreparedContexts() const;
     // Objects made outside any request or attachment.
     std::size_t brokerOwnedObjects() const;
-    // Memory that finished requests left for the next one's objects.
-    std::size_t cachedArenaBytes() const;
 
     // One provider operation: a context and a result, and the scope that
     // owns every object made on this thread until it is destroyed. Must be
@@ -97,7 +97,7 @@ class Broker
 
       private:
         detail::BrokerState& state_;
-        std::unique_ptr<detail::Arena> arena_;
+        std::unique_ptr<detail::OwnedObjects> objects_;
         Outcome outcome_;
         detail::ContextObject* context_;
         detail::ResultObject* result_;

@@ -15,7 +15,7 @@ namespace
 struct Scope
 {
     BrokerState* broker;
-    Arena* arena;
+    OwnedObjects* objects;
     const CMPIContext* attached;
 };
 
@@ -86,28 +86,27 @@ std::vector<BrokerState*> liveBrokers;
 
 } // namespace
 
-Arena::~Arena()
+OwnedObjects::~OwnedObjects()
 {
     clear();
 }
 
-std::size_t Arena::size() const
+std::size_t OwnedObjects::size() const
 {
     const std::lock_guard lock(mutex_);
     return objects_.size();
 }
 
-void Arena::clear()
+void OwnedObjects::clear()
 {
-    std::vector<Object*> doomed;
+    std::vector<std::unique_ptr<Object>> doomed;
     {
         const std::lock_guard lock(mutex_);
         doomed.swap(objects_);
     }
-    // Newest first, as a request's objects were freed before.
-    for (auto it = doomed.rbegin(); it != doomed.rend(); ++it)
+    while (!doomed.empty())
     {
-        std::destroy_at(*it);
+        doomed.pop_back();
     }
 }
 
@@ -148,10 +147,10 @@ BrokerState::~BrokerState()
         const std::lock_guard lock(liveMutex);
         std::erase(liveBrokers, this);
     }
-    brokerArena.clear();
+    brokerObjects.clear();
     {
         const std::lock_guard lock(attachMutex);
-        attachArenas.clear();
+        attachObjects.clear();
     }
     std::map<Object*, std::unique_ptr<Object>> doomed;
     {
@@ -184,7 +183,7 @@ BrokerState* BrokerState::forThisThread()
 
 CMPIStatus BrokerState::release(Object* object)
 {
-    if (object->ownership == Ownership::Arena)
+    if (object->ownership == Ownership::Scoped)
     {
         return okStatus();
     }
@@ -202,31 +201,31 @@ CMPIStatus BrokerState::release(Object* object)
     return okStatus();
 }
 
-Arena& BrokerState::currentArena()
+OwnedObjects& BrokerState::currentObjects()
 {
     for (auto it = scopes.rbegin(); it != scopes.rend(); ++it)
     {
         if (it->broker == this)
         {
-            return *it->arena;
+            return *it->objects;
         }
     }
-    return brokerArena;
+    return brokerObjects;
 }
 
-void BrokerState::pushScope(Arena* arena, const CMPIContext* attached)
+void BrokerState::pushScope(OwnedObjects* objects, const CMPIContext* attached)
 {
-    if (!scopes.push({this, arena, attached}))
+    if (!scopes.push({this, objects, attached}))
     {
         throw std::length_error("too many nested requests on one thread");
     }
 }
 
-void BrokerState::popScope(Arena* arena)
+void BrokerState::popScope(OwnedObjects* objects)
 {
     for (auto it = scopes.rbegin(); it != scopes.rend(); ++it)
     {
-        if (it->broker == this && it->arena == arena)
+        if (it->broker == this && it->objects == objects)
         {
             scopes.erase(std::next(it).base());
             return;
@@ -240,15 +239,16 @@ CMPIStatus BrokerState::attach(const CMPIContext* ctx)
     {
         return errorStatus(CMPI_RC_ERR_INVALID_HANDLE);
     }
-    Arena* arena = nullptr;
+    OwnedObjects* objects = nullptr;
     {
         const std::lock_guard lock(attachMutex);
-        arena = &attachArenas.emplace_back(&arenaBlocks);
+        objects = &attachObjects.emplace_back();
     }
-    if (!scopes.push({this, arena, ctx}))
+    if (!scopes.push({this, objects, ctx}))
     {
         const std::lock_guard lock(attachMutex);
-        attachArenas.remove_if([arena](const Arena& a) { return &a == arena; });
+        attachObjects.remove_if([objects](const OwnedObjects& a)
+                                { return &a == objects; });
         return errorStatus(CMPI_RC_ERR_FAILED);
     }
     return okStatus();
@@ -264,17 +264,17 @@ CMPIStatus BrokerState::detach(const CMPIContext* ctx)
     {
         if (it->broker == this && it->attached == ctx)
         {
-            Arena* arena = it->arena;
+            OwnedObjects* objects = it->objects;
             scopes.erase(std::next(it).base());
-            std::list<Arena> doomed;
+            std::list<OwnedObjects> doomed;
             {
                 const std::lock_guard lock(attachMutex);
                 const auto found = std::find_if(
-                    attachArenas.begin(), attachArenas.end(),
-                    [arena](const Arena& a) { return &a == arena; });
-                if (found != attachArenas.end())
+                    attachObjects.begin(), attachObjects.end(),
+                    [objects](const OwnedObjects& a) { return &a == objects; });
+                if (found != attachObjects.end())
                 {
-                    doomed.splice(doomed.begin(), attachArenas, found);
+                    doomed.splice(doomed.begin(), attachObjects, found);
                 }
             }
             ContextObject* context = ContextObject::of(ctx);

@@ -2,7 +2,6 @@
 // CMPIBroker handle and through every object's back pointer.
 #pragma once
 
-#include "BlockCache.h"
 #include "Faults.h"
 #include "Objects.h"
 #include "Schema.h"
@@ -53,12 +52,12 @@ struct BrokerState
     // broker, else nullptr.
     static BrokerState* forThisThread();
 
-    // A new object owned by the arena in scope on this thread: the open
-    // request, the attached thread's arena, or else the broker's own.
+    // A new object owned by the scope open on this thread: the open
+    // request, the attached thread's scope, or else the broker itself.
     template <typename T>
     T* make()
     {
-        return currentArena().template make<T>(*this);
+        return currentObjects().template make<T>(*this);
     }
     // A new object that lives until release() or the broker's end.
     template <typename T>
@@ -71,12 +70,12 @@ struct BrokerState
         owned.emplace(raw, std::move(object));
         return raw;
     }
-    // Frees clones and prepared contexts; harmless for arena objects.
+    // Frees clones and prepared contexts; harmless for scoped objects.
     CMPIStatus release(Object* object);
 
-    Arena& currentArena();
-    void pushScope(Arena* arena, const CMPIContext* attached);
-    void popScope(Arena* arena);
+    OwnedObjects& currentObjects();
+    void pushScope(OwnedObjects* objects, const CMPIContext* attached);
+    void popScope(OwnedObjects* objects);
     CMPIStatus attach(const CMPIContext* ctx);
     // Ends the attachment of this thread to @p ctx: frees what the thread
     // made meanwhile and, as SFCB does, the context itself when it came
@@ -130,16 +129,10 @@ struct BrokerState
     mutable std::mutex ownedMutex;
     std::map<Object*, std::unique_ptr<Object>> owned;
 
-    // The arena blocks kept between requests: enough for the objects of
-    // an enumeration of the largest log (65,535 entries) and then some.
-    static constexpr std::size_t arenaBlockLimit = std::size_t{128} << 20;
-    // Above the arenas, which give their blocks back to it.
-    BlockCache arenaBlocks{arenaBlockLimit};
-
     mutable std::mutex attachMutex;
-    std::list<Arena> attachArenas;
+    std::list<OwnedObjects> attachObjects;
 
-    Arena brokerArena{&arenaBlocks};
+    OwnedObjects brokerObjects;
 };
 
 // Hands a freshly made object to the provider, applying a planned fault:
@@ -167,9 +160,9 @@ CMPIStatus releaseObject(Handle* handle)
 }
 
 // clone() of every object table: a new broker-owned object of the same
-// type whose own state @p copyState copies over.
-template <typename Object, typename Handle, typename CopyState>
-Handle* cloneObject(const Handle* handle, CMPIStatus* rc, CopyState copyState)
+// type with the state of the original.
+template <typename Object, typename Handle>
+Handle* cloneObject(const Handle* handle, CMPIStatus* rc)
 {
     const Object* object = Object::of(handle);
     if (object == nullptr)
@@ -178,7 +171,7 @@ Handle* cloneObject(const Handle* handle, CMPIStatus* rc, CopyState copyState)
         return nullptr;
     }
     auto* copy = object->broker->template makeOwned<Object>(Ownership::Clone);
-    copyState(*copy, *object);
+    copy->copyFrom(*object);
     setStatus(rc, CMPI_RC_OK);
     return &copy->cmpi;
 }

@@ -6,6 +6,12 @@
 
 namespace host::detail
 {
+
+void ContextObject::copyFrom(const ContextObject& other)
+{
+    entries = other.entries;
+}
+
 namespace
 {
 
@@ -21,17 +27,6 @@ const Value* findEntry(const Ctx& c, const char* name)
         }
     }
     return nullptr;
-}
-
-CMPIStatus ctxRelease(CMPIContext* ctx)
-{
-    return releaseObject<Ctx>(ctx);
-}
-
-CMPIContext* ctxClone(const CMPIContext* ctx, CMPIStatus* rc)
-{
-    return cloneObject<Ctx>(
-        ctx, rc, [](auto& to, const auto& from) { to.entries = from.entries; });
 }
 
 CMPIData ctxGetEntry(const CMPIContext* ctx, const char* name, CMPIStatus* rc)
@@ -94,8 +89,13 @@ CMPIStatus ctxAddEntry(const CMPIContext* ctx, const char* name,
 } // namespace
 
 CMPIContextFT contextFT = {
-    200,           ctxRelease,       ctxClone,    ctxGetEntry,
-    ctxGetEntryAt, ctxGetEntryCount, ctxAddEntry,
+    200,
+    releaseObject<Ctx, CMPIContext>,
+    cloneObject<Ctx, CMPIContext>,
+    ctxGetEntry,
+    ctxGetEntryAt,
+    ctxGetEntryCount,
+    ctxAddEntry,
 };
 
 } // namespace host::detail

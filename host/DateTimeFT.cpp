@@ -4,19 +4,14 @@
 
 namespace host::detail
 {
+
+void DateTimeObject::copyFrom(const DateTimeObject& other)
+{
+    text = other.text;
+}
+
 namespace
 {
-
-CMPIStatus dateTimeRelease(CMPIDateTime* dt)
-{
-    return releaseObject<DateTimeObject>(dt);
-}
-
-CMPIDateTime* dateTimeClone(const CMPIDateTime* dt, CMPIStatus* rc)
-{
-    return cloneObject<DateTimeObject>(
-        dt, rc, [](auto& to, const auto& from) { to.text = from.text; });
-}
 
 CMPIUint64 dateTimeGetBinaryFormat(const CMPIDateTime* dt, CMPIStatus* rc)
 {
@@ -61,8 +56,8 @@ CMPIBoolean dateTimeIsInterval(const CMPIDateTime* dt, CMPIStatus* rc)
 
 CMPIDateTimeFT dateTimeFT = {
     200,
-    dateTimeRelease,
-    dateTimeClone,
+    releaseObject<DateTimeObject, CMPIDateTime>,
+    cloneObject<DateTimeObject, CMPIDateTime>,
     dateTimeGetBinaryFormat,
     dateTimeGetStringFormat,
     dateTimeIsInterval,

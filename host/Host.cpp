@@ -81,30 +81,18 @@ IndicationFilter IndicationFilter::forClass(std::string className,
     return filter;
 }
 
-Host::Host(const std::string& libraryPath, HostOptions options) :
-    broker_(std::move(options.schema)), brokerPerMI_(options.brokerPerMI),
-    library_(std::make_unique<ProviderLibrary>(libraryPath,
-                                               std::move(options.providerName)))
+Host::Host(HostOptions options) :
+    broker_(std::move(options.schema)), brokerPerMI_(options.brokerPerMI)
 {
-    createMIs(nullptr);
+    if (!options.libraryPath.empty())
+    {
+        library_ = std::make_unique<ProviderLibrary>(
+            options.libraryPath, std::move(options.providerName));
+    }
+    createMIs(options.factories);
 }
 
-Host::Host(const std::string& libraryPath, std::string providerName,
-           Schema schema) :
-    broker_(std::move(schema)),
-    library_(
-        std::make_unique<ProviderLibrary>(libraryPath, std::move(providerName)))
-{
-    createMIs(nullptr);
-}
-
-Host::Host(const ProviderFactories& factories, Schema schema) :
-    broker_(std::move(schema))
-{
-    createMIs(&factories);
-}
-
-void Host::createMIs(const ProviderFactories* factories)
+void Host::createMIs(const ProviderFactories& factories)
 {
     try
     {
@@ -118,7 +106,7 @@ void Host::createMIs(const ProviderFactories* factories)
     }
 }
 
-void Host::createEachMI(const ProviderFactories* factories)
+void Host::createEachMI(const ProviderFactories& factories)
 {
     const auto& lib = library_;
     const auto need = [](auto* factory, const char* type)
@@ -133,23 +121,22 @@ void Host::createEachMI(const ProviderFactories* factories)
         broker_, instanceBroker(), "instance",
         [&](const CMPIBroker* b, const CMPIContext* c, CMPIStatus* s)
         {
-            return factories ? need(factories->instance, "instance")(b, c, s)
-                             : lib->createInstanceMI(b, c, s);
+            return lib ? lib->createInstanceMI(b, c, s)
+                       : need(factories.instance, "instance")(b, c, s);
         });
     methodMI_ = createMI<CMPIMethodMI>(
         broker_, methodBroker(), "method",
         [&](const CMPIBroker* b, const CMPIContext* c, CMPIStatus* s)
         {
-            return factories ? need(factories->method, "method")(b, c, s)
-                             : lib->createMethodMI(b, c, s);
+            return lib ? lib->createMethodMI(b, c, s)
+                       : need(factories.method, "method")(b, c, s);
         });
     indicationMI_ = createMI<CMPIIndicationMI>(
         broker_, indicationBroker(), "indication",
         [&](const CMPIBroker* b, const CMPIContext* c, CMPIStatus* s)
         {
-            return factories
-                       ? need(factories->indication, "indication")(b, c, s)
-                       : lib->createIndicationMI(b, c, s);
+            return lib ? lib->createIndicationMI(b, c, s)
+                       : need(factories.indication, "indication")(b, c, s);
         });
 }
 

@@ -30,22 +30,30 @@ struct ProviderFactories
 // A subscription's filter as an object manager holds it.
 struct IndicationFilter
 {
-    std::string query; // e.g. SELECT * FROM ZAN_MgmtHwLogClearEvent
+    std::string query; // e.g. SELECT * FROM Some_AlertIndication
     std::string language = "WQL";
     std::string className; // the indication class the query selects
-    std::string sourceNamespace = "root/zanqx";
+    std::string sourceNamespace;
 
     // sourceNamespace:className, the class path passed with the filter.
     ObjectPath classPath() const;
     // A filter for every indication of @p className.
-    static IndicationFilter
-    forClass(std::string className, std::string sourceNamespace = "root/zanqx");
+    static IndicationFilter forClass(std::string className,
+                                     std::string sourceNamespace);
 };
 
+// The provider a Host loads and how it presents the broker to it.
 struct HostOptions
 {
-    std::string providerName = "SELProvider";
-    Schema schema = selSchema();
+    // The provider library, whose factories are named after providerName
+    // (<providerName>_Create_InstanceMI and its siblings); when empty, the
+    // factories below, linked into the program, are used instead.
+    std::string libraryPath;
+    std::string providerName;
+    ProviderFactories factories;
+    // The classes the provider serves, for the instance paths the broker
+    // builds.
+    Schema schema;
     // Hand each MI factory a broker pointer of its own (over one broker), as
     // OpenPegasus does, instead of the same one for all, as SFCB does.
     bool brokerPerMI = false;
@@ -61,12 +69,7 @@ class Host
   public:
     // Throws LoadError (a std::runtime_error) if the library cannot be
     // loaded, lacks a factory, or a factory fails.
-    explicit Host(const std::string& libraryPath,
-                  std::string providerName = "SELProvider",
-                  Schema schema = selSchema());
-    Host(const std::string& libraryPath, HostOptions options);
-    explicit Host(const ProviderFactories& factories,
-                  Schema schema = selSchema());
+    explicit Host(HostOptions options);
     ~Host();
     Host(const Host&) = delete;
     Host& operator=(const Host&) = delete;
@@ -121,8 +124,8 @@ class Host
     CMPIStatus cleanupAll(bool terminating);
 
   private:
-    void createMIs(const ProviderFactories* factories);
-    void createEachMI(const ProviderFactories* factories);
+    void createMIs(const ProviderFactories& factories);
+    void createEachMI(const ProviderFactories& factories);
 
     Broker broker_;
     bool brokerPerMI_ = false;

@@ -8,6 +8,14 @@
 namespace host::detail
 {
 
+void InstanceObject::copyFrom(const InstanceObject& other)
+{
+    path = other.path;
+    properties = other.properties;
+    filter = other.filter;
+    filterKeys = other.filterKeys;
+}
+
 bool InstanceObject::accepts(std::string_view name) const
 {
     if (!filter)
@@ -62,23 +70,6 @@ namespace
 {
 
 using Inst = InstanceObject;
-
-CMPIStatus instRelease(CMPIInstance* inst)
-{
-    return releaseObject<Inst>(inst);
-}
-
-CMPIInstance* instClone(const CMPIInstance* inst, CMPIStatus* rc)
-{
-    return cloneObject<Inst>(inst, rc,
-                             [](auto& to, const auto& from)
-                             {
-                                 to.path = from.path;
-                                 to.properties = from.properties;
-                                 to.filter = from.filter;
-                                 to.filterKeys = from.filterKeys;
-                             });
-}
 
 CMPIData instGetProperty(const CMPIInstance* inst, const char* name,
                          CMPIStatus* rc)
@@ -208,8 +199,8 @@ CMPIStatus instSetObjectPath(CMPIInstance* inst, const CMPIObjectPath* op)
 // setPropertyWithOrigin stays NULL, as in SFCB.
 CMPIInstanceFT instanceFT = {
     200,
-    instRelease,
-    instClone,
+    releaseObject<Inst, CMPIInstance>,
+    cloneObject<Inst, CMPIInstance>,
     instGetProperty,
     instGetPropertyAt,
     instGetPropertyCount,

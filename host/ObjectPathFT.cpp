@@ -4,21 +4,16 @@
 
 namespace host::detail
 {
+
+void ObjectPathObject::copyFrom(const ObjectPathObject& other)
+{
+    path = other.path;
+}
+
 namespace
 {
 
 using Op = ObjectPathObject;
-
-CMPIStatus opRelease(CMPIObjectPath* op)
-{
-    return releaseObject<Op>(op);
-}
-
-CMPIObjectPath* opClone(const CMPIObjectPath* op, CMPIStatus* rc)
-{
-    return cloneObject<Op>(
-        op, rc, [](auto& to, const auto& from) { to.path = from.path; });
-}
 
 CMPIStatus setText(CMPIObjectPath* op, const char* text,
                    Text ObjectPath::*member)
@@ -243,8 +238,8 @@ CMPIString* opToString(const CMPIObjectPath* op, CMPIStatus* rc)
 
 CMPIObjectPathFT objectPathFT = {
     200,
-    opRelease,
-    opClone,
+    releaseObject<Op, CMPIObjectPath>,
+    cloneObject<Op, CMPIObjectPath>,
     opSetNameSpace,
     opGetNameSpace,
     opSetHostname,

@@ -9,7 +9,6 @@
 
 #include <algorithm>
 #include <memory>
-#include <memory_resource>
 #include <mutex>
 #include <optional>
 #include <string>
@@ -32,7 +31,7 @@ extern CMPISelectExpFT selectExpFT;
 
 enum class Ownership
 {
-    Arena,    // freed with its request (or with the broker)
+    Scoped,   // freed with its request (or with the broker)
     Clone,    // made by clone(): freed by release() or with the broker
     Prepared, // a prepareAttachThread context: likewise
 };
@@ -45,10 +44,11 @@ struct Object
     Object& operator=(const Object&) = delete;
 
     BrokerState* broker;
-    Ownership ownership = Ownership::Arena;
+    Ownership ownership = Ownership::Scoped;
 };
 
-// Binds the embedded CMPI struct to its object and function table.
+// Binds the embedded CMPI struct to its object and function table. Each
+// object also has copyFrom(other), which copies its own state for clone().
 template <typename C, typename FT, FT* table>
 struct Encapsulated : Object
 {
@@ -80,6 +80,8 @@ struct StringObject : Encapsulated<CMPIString, CMPIStringFT, &stringFT>
         return from<StringObject>(s);
     }
     std::optional<std::string> text;
+
+    void copyFrom(const StringObject& other);
 };
 
 struct ArrayObject : Encapsulated<CMPIArray, CMPIArrayFT, &arrayFT>
@@ -91,6 +93,8 @@ struct ArrayObject : Encapsulated<CMPIArray, CMPIArrayFT, &arrayFT>
     }
     CMPIType elementType = CMPI_null; // never CMPI_chars
     std::vector<Value> elements;
+
+    void copyFrom(const ArrayObject& other);
 };
 
 struct DateTimeObject : Encapsulated<CMPIDateTime, CMPIDateTimeFT, &dateTimeFT>
@@ -101,6 +105,8 @@ struct DateTimeObject : Encapsulated<CMPIDateTime, CMPIDateTimeFT, &dateTimeFT>
         return from<DateTimeObject>(d);
     }
     Text text; // CIM datetime text
+
+    void copyFrom(const DateTimeObject& other);
 };
 
 struct ObjectPathObject :
@@ -112,6 +118,8 @@ struct ObjectPathObject :
         return from<ObjectPathObject>(p);
     }
     ObjectPath path;
+
+    void copyFrom(const ObjectPathObject& other);
 };
 
 struct InstanceObject : Encapsulated<CMPIInstance, CMPIInstanceFT, &instanceFT>
@@ -131,6 +139,7 @@ struct InstanceObject : Encapsulated<CMPIInstance, CMPIInstanceFT, &instanceFT>
     // the key properties set on the instance, in the class's key order.
     ObjectPath effectivePath() const;
     Instance snapshot() const;
+    void copyFrom(const InstanceObject& other);
 };
 
 struct ResultObject : Encapsulated<CMPIResult, CMPIResultFT, &resultFT>
@@ -154,6 +163,8 @@ struct ContextObject : Encapsulated<CMPIContext, CMPIContextFT, &contextFT>
         return from<ContextObject>(c);
     }
     NamedValues entries; // names compare exactly
+
+    void copyFrom(const ContextObject& other);
 };
 
 struct ArgsObject : Encapsulated<CMPIArgs, CMPIArgsFT, &argsFT>
@@ -164,6 +175,8 @@ struct ArgsObject : Encapsulated<CMPIArgs, CMPIArgsFT, &argsFT>
         return from<ArgsObject>(a);
     }
     NamedValues args;
+
+    void copyFrom(const ArgsObject& other);
 };
 
 // The filter an object manager hands to an indication MI: the query and
@@ -178,49 +191,37 @@ struct SelectExpObject :
     }
     std::string query;
     std::string language;
+
+    void copyFrom(const SelectExpObject& other);
 };
 
-// Owns broker objects until it is cleared or destroyed. Thread-safe.
-// Objects are placed one after another in blocks the arena takes from the
-// heap, and those blocks go back only with the arena: a request makes
-// several objects for every instance it returns, and giving each back to
-// the heap on its own, at the end of a large request, cost more than
-// making them.
-class Arena
+// Owns the broker objects made in one scope (a request, a thread attached
+// to a context, or the broker itself) until it is cleared or destroyed.
+// Thread-safe.
+class OwnedObjects
 {
   public:
-    explicit Arena(
-        std::pmr::memory_resource* blocks = std::pmr::new_delete_resource()) :
-        memory_(blocks)
-    {
-    }
-    ~Arena();
-    Arena(const Arena&) = delete;
-    Arena& operator=(const Arena&) = delete;
+    OwnedObjects() = default;
+    ~OwnedObjects();
+    OwnedObjects(const OwnedObjects&) = delete;
+    OwnedObjects& operator=(const OwnedObjects&) = delete;
 
     template <typename T>
     T* make(BrokerState& state)
     {
+        auto object = std::make_unique<T>(state);
+        T* made = object.get();
         const std::lock_guard lock(mutex_);
-        if (objects_.size() == objects_.capacity())
-        {
-            // Room first, so that the object is never made and then lost.
-            objects_.reserve(std::max<std::size_t>(16, 2 * objects_.size()));
-        }
-        T* object =
-            std::pmr::polymorphic_allocator<T>(&memory_).template new_object<T>(
-                state);
-        objects_.push_back(object);
-        return object;
+        objects_.push_back(std::move(object));
+        return made;
     }
     std::size_t size() const;
-    // Ends the life of every object; their memory stays with the arena.
+    // Ends the life of every object, newest first.
     void clear();
 
   private:
     mutable std::mutex mutex_;
-    std::pmr::monotonic_buffer_resource memory_;
-    std::vector<Object*> objects_;
+    std::vector<std::unique_ptr<Object>> objects_;
 };
 
 inline CMPIStatus okStatus()

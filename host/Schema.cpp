@@ -42,18 +42,4 @@ const ClassKeys* Schema::find(std::string_view className) const
     return nullptr;
 }
 
-Schema selSchema()
-{
-    Schema schema;
-    schema.add({"ZAN_MgmtHwLog",
-                {{"Name", CMPI_string}, {"CreationClassName", CMPI_string}}});
-    schema.add({"ZAN_MgmtHwLogEntry",
-                {{"CreationClassName", CMPI_string},
-                 {"LogCreationClassName", CMPI_string},
-                 {"LogName", CMPI_string},
-                 {"RecordID", CMPI_string},
-                 {"MessageTimestamp", CMPI_dateTime}}});
-    return schema;
-}
-
 } // namespace host

@@ -31,7 +31,4 @@ class Schema
     std::vector<ClassKeys> classes_;
 };
 
-// ZAN_MgmtHwLog and ZAN_MgmtHwLogEntry.
-Schema selSchema();
-
 } // namespace host

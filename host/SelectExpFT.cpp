@@ -6,25 +6,17 @@
 
 namespace host::detail
 {
+
+void SelectExpObject::copyFrom(const SelectExpObject& other)
+{
+    query = other.query;
+    language = other.language;
+}
+
 namespace
 {
 
 using Exp = SelectExpObject;
-
-CMPIStatus expRelease(CMPISelectExp* se)
-{
-    return releaseObject<Exp>(se);
-}
-
-CMPISelectExp* expClone(const CMPISelectExp* se, CMPIStatus* rc)
-{
-    return cloneObject<Exp>(se, rc,
-                            [](auto& to, const auto& from)
-                            {
-                                to.query = from.query;
-                                to.language = from.language;
-                            });
-}
 
 CMPIBoolean expEvaluate(const CMPISelectExp* se, const CMPIInstance*,
                         CMPIStatus* rc)
@@ -66,8 +58,14 @@ CMPIBoolean expEvaluateUsingAccessor(const CMPISelectExp* se, CMPIAccessor*,
 } // namespace
 
 CMPISelectExpFT selectExpFT = {
-    200,          expRelease,      expClone,        expEvaluate,
-    expGetString, expGetCondition, expGetCondition, expEvaluateUsingAccessor,
+    200,
+    releaseObject<Exp, CMPISelectExp>,
+    cloneObject<Exp, CMPISelectExp>,
+    expEvaluate,
+    expGetString,
+    expGetCondition,
+    expGetCondition,
+    expEvaluateUsingAccessor,
 };
 
 } // namespace host::detail

@@ -3,19 +3,14 @@
 
 namespace host::detail
 {
+
+void StringObject::copyFrom(const StringObject& other)
+{
+    text = other.text;
+}
+
 namespace
 {
-
-CMPIStatus stringRelease(CMPIString* st)
-{
-    return releaseObject<StringObject>(st);
-}
-
-CMPIString* stringClone(const CMPIString* st, CMPIStatus* rc)
-{
-    return cloneObject<StringObject>(
-        st, rc, [](auto& to, const auto& from) { to.text = from.text; });
-}
 
 const char* stringGetCharPtr(const CMPIString* st, CMPIStatus* rc)
 {
@@ -39,8 +34,8 @@ const char* stringGetCharPtr(const CMPIString* st, CMPIStatus* rc)
 
 CMPIStringFT stringFT = {
     200,
-    stringRelease,
-    stringClone,
+    releaseObject<StringObject, CMPIString>,
+    cloneObject<StringObject, CMPIString>,
     stringGetCharPtr,
 };
 

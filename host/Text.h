@@ -17,6 +17,13 @@ namespace host
 // keeps inline, and a large request keeps tens of them for every instance
 // it returns: each would be a heap block of its own, made and later freed
 // one by one, where a Text is part of the value or list that holds it.
+//
+// Measured with std::string in its place (bench/scaling.sh and
+// bench/selprov-rss.sh, release build): the names of 65,535 log entries took
+// 6.15 instead of 4.65 us per entry in the host, 1.26 times the time per
+// entry at 4,096 entries (1.19 with Text), and selprov peaked at 244 MB
+// and 0.95 s of CPU instead of 221 MB and 0.85 s: at the edge of the
+// large-log goals of 1.25, 250 MB and 1 s.
 class Text
 {
   public:

@@ -3,6 +3,9 @@
 #include "BrokerState.h"
 #include "Objects.h"
 
+#include <algorithm>
+#include <array>
+
 namespace host::detail
 {
 namespace
@@ -134,30 +137,18 @@ CMPIrc readArray(const CMPIArray* array, CMPIType type, Value& out)
     return CMPI_RC_OK;
 }
 
+// The scalar types a Value holds (CMPI_chars is read as a string): the
+// element types an argument or array may have.
+constexpr std::array<CMPIType, 16> knownScalars{
+    CMPI_boolean, CMPI_char16, CMPI_uint8,    CMPI_uint16,
+    CMPI_uint32,  CMPI_uint64, CMPI_sint8,    CMPI_sint16,
+    CMPI_sint32,  CMPI_sint64, CMPI_real32,   CMPI_real64,
+    CMPI_string,  CMPI_chars,  CMPI_dateTime, CMPI_ref};
+
 bool isKnownScalar(CMPIType type)
 {
-    switch (type)
-    {
-        case CMPI_boolean:
-        case CMPI_char16:
-        case CMPI_uint8:
-        case CMPI_uint16:
-        case CMPI_uint32:
-        case CMPI_uint64:
-        case CMPI_sint8:
-        case CMPI_sint16:
-        case CMPI_sint32:
-        case CMPI_sint64:
-        case CMPI_real32:
-        case CMPI_real64:
-        case CMPI_string:
-        case CMPI_chars:
-        case CMPI_dateTime:
-        case CMPI_ref:
-            return true;
-        default:
-            return false;
-    }
+    return std::find(knownScalars.begin(), knownScalars.end(), type) !=
+           knownScalars.end();
 }
 
 } // namespace

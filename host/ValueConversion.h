@@ -26,7 +26,7 @@ CMPIrc readNamedArgument(const char* name, const CMPIValue* value,
 CMPIrc readData(const CMPIData& data, Value& out);
 
 // A CMPIData for a stored value; strings, datetimes, paths and arrays are
-// new objects in the current arena.
+// new objects in the current scope.
 CMPIData makeData(BrokerState& broker, const Value& value,
                   CMPIValueState extraState = CMPI_goodValue);
 

@@ -1,5 +1,7 @@
 #pragma once
 
+#include "SelClasses.h"
+
 #include <optional>
 #include <stdexcept>
 #include <string>
@@ -35,7 +37,7 @@ struct Options
 {
     std::optional<std::string> library;
     std::optional<std::string> config;
-    std::string nameSpace = "root/zanqx";
+    std::string nameSpace = selclasses::nameSpace;
     bool json = false;
     bool timing = false; // write each request's time to standard error
     Command command = Command::Help;

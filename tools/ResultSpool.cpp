@@ -16,18 +16,18 @@ ResultSpool::ResultSpool(bool json) : json_(json), file_(std::tmpfile())
     {
         if (json_)
         {
-            keep(",\n ", host::jsonInstance(instance));
+            keep(",\n ", selprov::jsonInstance(instance));
         }
         else
         {
-            keep("\n", host::formatMof(instance));
+            keep("\n", selprov::formatMof(instance));
         }
     };
     handlers_.path = [this](const host::ObjectPath& path)
     {
         if (json_)
         {
-            keep(",\n ", host::jsonString(path.toString()));
+            keep(",\n ", selprov::jsonString(path.toString()));
         }
         else
         {

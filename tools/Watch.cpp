@@ -62,11 +62,11 @@ void print(const Options& options, const host::DeliveredIndication& got)
 {
     if (options.json)
     {
-        std::cout << host::jsonInstance(got.instance) << "\n";
+        std::cout << selprov::jsonInstance(got.instance) << "\n";
     }
     else
     {
-        std::cout << host::formatMof(got.instance) << "\n";
+        std::cout << selprov::formatMof(got.instance) << "\n";
     }
     std::cout.flush();
 }

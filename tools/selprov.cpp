@@ -5,6 +5,7 @@
 #include "Platform.h"
 #include "Printing.h"
 #include "ResultSpool.h"
+#include "SelClasses.h"
 #include "StatusText.h"
 #include "Watch.h"
 #include "ipmi/IpmiSource.h"
@@ -64,7 +65,7 @@ std::string defaultLibrary()
 
 host::ObjectPath targetPath(const selprov::Options& o)
 {
-    const host::Schema schema = host::selSchema();
+    const host::Schema schema = selclasses::schema();
     host::ObjectPath path;
     try
     {
@@ -99,7 +100,7 @@ void printReturnValue(const selprov::Options& o, const host::Outcome& out)
     const host::Value& rv = out.data.front();
     if (o.json)
     {
-        std::cout << "{\"ReturnValue\": " << host::jsonValue(rv) << "}\n";
+        std::cout << "{\"ReturnValue\": " << selprov::jsonValue(rv) << "}\n";
     }
     else
     {
@@ -344,7 +345,8 @@ int main(int argc, char** argv)
 
     try
     {
-        host::Host h(options.library.value_or(defaultLibrary()));
+        host::Host h(selclasses::hostOptions(
+            options.library.value_or(defaultLibrary())));
         if (options.command == selprov::Command::Batch)
         {
             return runBatch(options, h);

@@ -6,6 +6,7 @@
 #include "NodeTree.h"
 #include "Platform.h"
 #include "ProvidedInstances.h"
+#include "SelClasses.h"
 #include "entry/EntryFixture.h"
 
 #include <chrono>
@@ -40,12 +41,11 @@ std::vector<host::Instance> deliverOneOfEach()
     QX::Platform::overrideSource(source);
     std::vector<host::Instance> delivered;
     {
-        host::Host host(SELPROV_LIBRARY);
+        host::Host host(selclasses::hostOptions(SELPROV_LIBRARY));
         host::IndicationInbox inbox = host.listen(nameSpace);
         for (const std::string& className : indicationClassNames())
         {
-            host.activateFilter(host::IndicationFilter::forClass(className),
-                                true);
+            host.activateFilter(selclasses::filterFor(className), true);
         }
         host.enableIndications();
         for (const QX::SimulatedAlert alert :

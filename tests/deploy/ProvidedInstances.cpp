@@ -5,6 +5,7 @@
 #include "MemorySource.h"
 #include "NodeTree.h"
 #include "Platform.h"
+#include "SelClasses.h"
 #include "entry/EntryFixture.h"
 
 namespace deploy
@@ -53,7 +54,8 @@ host::ObjectPath classPath(const std::string& className)
 void ProvidedInstances::SetUp()
 {
     CVLog::CVLogger::setSink(nullptr);
-    host_ = std::make_unique<host::Host>(SELPROV_LIBRARY);
+    host_ =
+        std::make_unique<host::Host>(selclasses::hostOptions(SELPROV_LIBRARY));
     QX::Platform::overrideSource(
         std::make_shared<QX::MemorySource>(treeWithEveryProperty()));
 }

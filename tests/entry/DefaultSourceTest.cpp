@@ -6,6 +6,7 @@
 // a line in the log as well.
 #include "CaptureSink.h"
 #include "EntryFixture.h"
+#include "SelClasses.h"
 
 #include <cstdlib>
 #include <filesystem>
@@ -182,8 +183,7 @@ TEST_F(DefaultSource, AWatchThePlatformCannotStartIsAFailureInTheLog)
     CVLog::CVLogger::setSink(capture);
     CVLog::CVLogger::configure(CVLog::LoggerSettings{});
     ::testing::internal::CaptureStderr();
-    const auto filter =
-        host::IndicationFilter::forClass("ZAN_MgmtHwLogEntryEvent");
+    const auto filter = selclasses::filterFor("ZAN_MgmtHwLogEntryEvent");
     const host::Outcome outcome = host().activateFilter(filter, true);
     const std::string written = ::testing::internal::GetCapturedStderr();
     CVLog::CVLogger::configure(previous);

@@ -1,6 +1,7 @@
 #include "EntryFixture.h"
 
 #include "CVLogger.h"
+#include "SelClasses.h"
 
 namespace entry
 {
@@ -52,7 +53,8 @@ void ProviderTest::SetUp()
 {
     // Keep the provider's diagnostics out of the system log during tests.
     CVLog::CVLogger::setSink(nullptr);
-    host_ = std::make_unique<host::Host>(SELPROV_LIBRARY);
+    host_ =
+        std::make_unique<host::Host>(selclasses::hostOptions(SELPROV_LIBRARY));
 }
 
 void ProviderTest::TearDown()

@@ -1,5 +1,6 @@
 #include "EntryFixture.h"
 #include "ProviderLibrary.h"
+#include "SelClasses.h"
 
 #include <cstring>
 
@@ -14,8 +15,8 @@ using entry::ProviderTest;
 TEST(FactoryTest, FactoriesReturnTheSameThreeMIsWhateverTheOrder)
 {
     host::ProviderLibrary library(SELPROV_LIBRARY, "SELProvider");
-    host::Broker first;
-    host::Broker second;
+    host::Broker first{selclasses::schema()};
+    host::Broker second{selclasses::schema()};
     CMPIStatus status{CMPI_RC_OK, nullptr};
     CMPIMethodMI* method =
         library.createMethodMI(first.cmpi(), nullptr, &status);
@@ -46,7 +47,7 @@ TEST(FactoryTest, FactoriesReturnTheSameThreeMIsWhateverTheOrder)
 TEST(FactoryTest, NullContextAndStatusAreAccepted)
 {
     host::ProviderLibrary library(SELPROV_LIBRARY, "SELProvider");
-    host::Broker broker;
+    host::Broker broker{selclasses::schema()};
     EXPECT_NE(library.createInstanceMI(broker.cmpi(), nullptr, nullptr),
               nullptr);
     EXPECT_NE(library.createMethodMI(broker.cmpi(), nullptr, nullptr), nullptr);
@@ -57,7 +58,7 @@ TEST(FactoryTest, NullContextAndStatusAreAccepted)
 TEST(FactoryTest, StatusIsNeverWritten)
 {
     host::ProviderLibrary library(SELPROV_LIBRARY, "SELProvider");
-    host::Broker broker;
+    host::Broker broker{selclasses::schema()};
     const auto sentinel = reinterpret_cast<CMPIString*>(0x1234);
     CMPIStatus status{CMPI_RC_ERR_NOT_FOUND, sentinel};
     library.createInstanceMI(broker.cmpi(), nullptr, &status);
@@ -70,8 +71,8 @@ TEST(FactoryTest, StatusIsNeverWritten)
 TEST(FactoryTest, TheLastBrokerPassedIsTheOneOperationsUse)
 {
     host::ProviderLibrary library(SELPROV_LIBRARY, "SELProvider");
-    host::Broker first;
-    host::Broker last;
+    host::Broker first{selclasses::schema()};
+    host::Broker last{selclasses::schema()};
     CMPIInstanceMI* mi =
         library.createInstanceMI(first.cmpi(), nullptr, nullptr);
     library.createMethodMI(last.cmpi(), nullptr, nullptr);
@@ -92,7 +93,7 @@ TEST(FactoryTest, TheLastBrokerPassedIsTheOneOperationsUse)
 TEST(FunctionTables, NamesAndVersions)
 {
     host::ProviderLibrary library(SELPROV_LIBRARY, "SELProvider");
-    host::Broker broker;
+    host::Broker broker{selclasses::schema()};
     const CMPIInstanceMI* instance =
         library.createInstanceMI(broker.cmpi(), nullptr, nullptr);
     const CMPIMethodMI* method =

@@ -1,6 +1,7 @@
 #include "IndicationFixture.h"
 
 #include "CapturedLines.h"
+#include "SelClasses.h"
 
 namespace entry
 {
@@ -57,7 +58,7 @@ void IndicationTest::TearDown()
 void IndicationTest::subscribe(const std::string& className,
                                bool firstActivation)
 {
-    const auto filter = host::IndicationFilter::forClass(className);
+    const auto filter = selclasses::filterFor(className);
     ASSERT_EQ(host().authorizeFilter(filter, "root").rc, CMPI_RC_OK);
     ASSERT_EQ(host().mustPoll(filter).rc, CMPI_RC_OK);
     ASSERT_EQ(host().activateFilter(filter, firstActivation).rc, CMPI_RC_OK);
@@ -68,7 +69,7 @@ void IndicationTest::unsubscribeLikeSfcb(const std::string& className)
     ASSERT_EQ(host().disableIndications().rc, CMPI_RC_OK);
     host::ObjectPath noClass;
     noClass.nameSpace = nameSpace;
-    const auto filter = host::IndicationFilter::forClass(className);
+    const auto filter = selclasses::filterFor(className);
     ASSERT_EQ(host().deActivateFilter(filter, true, &noClass).rc, CMPI_RC_OK);
 }
 

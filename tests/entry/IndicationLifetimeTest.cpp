@@ -2,6 +2,7 @@
 // at once from several threads.
 #include "IndicationFixture.h"
 #include "ProviderLibrary.h"
+#include "SelClasses.h"
 
 #include <atomic>
 #include <dlfcn.h>
@@ -24,7 +25,7 @@ class IndicationLifetime : public WatchdogSourceTest
         for (const char* className :
              {entryEvent, clearEvent, fullEvent, restartEvent})
         {
-            const auto filter = host::IndicationFilter::forClass(className);
+            const auto filter = selclasses::filterFor(className);
             ASSERT_EQ(host.activateFilter(filter, true).rc, CMPI_RC_OK);
             if (twice)
             {
@@ -59,7 +60,7 @@ TEST_F(IndicationLifetime, UnloadingWhileAlertsFlowRemovesTheWatches)
                 }
             });
         {
-            host::Host host(SELPROV_LIBRARY);
+            host::Host host(selclasses::hostOptions(SELPROV_LIBRARY));
             host::IndicationInbox inbox = host.listen(nameSpace);
             // Counters at 2: disabling at unload leaves the watches on,
             // and the library's own teardown must remove them.
@@ -85,9 +86,9 @@ TEST_F(IndicationLifetime, TenThousandDeliveriesKeepNothing)
 #else
     constexpr int deliveries = 10000;
 #endif
-    host::Host host(SELPROV_LIBRARY);
+    host::Host host(selclasses::hostOptions(SELPROV_LIBRARY));
     host::IndicationInbox inbox = host.listen(nameSpace);
-    const auto filter = host::IndicationFilter::forClass(entryEvent);
+    const auto filter = selclasses::filterFor(entryEvent);
     ASSERT_EQ(host.activateFilter(filter, true).rc, CMPI_RC_OK);
     ASSERT_EQ(host.enableIndications().rc, CMPI_RC_OK);
     const std::string entry = QX::MemorySource::entryPath("/bmc0/sel", 1);
@@ -112,7 +113,7 @@ TEST_F(IndicationLifetime, TenThousandDeliveriesKeepNothing)
 
 TEST_F(IndicationLifetime, EverythingAtOnceFromSeveralThreads)
 {
-    host::Host host(SELPROV_LIBRARY);
+    host::Host host(selclasses::hostOptions(SELPROV_LIBRARY));
     host::IndicationInbox inbox = host.listen(nameSpace);
     subscribeAll(host, false);
     std::atomic<bool> stop{false};
@@ -141,8 +142,7 @@ TEST_F(IndicationLifetime, EverythingAtOnceFromSeveralThreads)
                                      restartEvent};
             for (int i = 0; i < 200; ++i)
             {
-                const auto filter =
-                    host::IndicationFilter::forClass(classes[i % 4]);
+                const auto filter = selclasses::filterFor(classes[i % 4]);
                 EXPECT_EQ(host.activateFilter(filter, true).rc, CMPI_RC_OK);
                 EXPECT_EQ(host.deActivateFilter(filter, true).rc, CMPI_RC_OK);
             }

@@ -1,6 +1,7 @@
 // The indication MI's operations through the loaded library, in the call
 // orders of the two object managers it runs in.
 #include "IndicationFixture.h"
+#include "SelClasses.h"
 
 #include <gtest/gtest.h>
 
@@ -37,7 +38,7 @@ TEST_F(IndicationSubscription, AnUnknownClassIsAcceptedAndIgnored)
     for (const char* className : {"ZAN_MgmtHwLogEntryEvent ",
                                   "zan_MgmtHwLogEntryEvent", "CIM_Alert", ""})
     {
-        const auto filter = host::IndicationFilter::forClass(className);
+        const auto filter = selclasses::filterFor(className);
         const host::Outcome outcome = host().activateFilter(filter, true);
         EXPECT_EQ(outcome.rc, CMPI_RC_OK) << className;
         EXPECT_FALSE(outcome.message.has_value());
@@ -64,7 +65,7 @@ TEST_F(IndicationSubscription, EveryActivationSavesAContextAndCounts)
 TEST_F(IndicationSubscription, DeactivationKeepsTheSavedContext)
 {
     subscribe(entryEvent);
-    const auto filter = host::IndicationFilter::forClass(entryEvent);
+    const auto filter = selclasses::filterFor(entryEvent);
     ASSERT_EQ(host().deActivateFilter(filter, true).rc, CMPI_RC_OK);
     ASSERT_EQ(host().deActivateFilter(filter, true).rc, CMPI_RC_OK);
     EXPECT_EQ(calls(BrokerCall::PrepareAttachThread), 1u);
@@ -123,7 +124,7 @@ TEST_F(IndicationSubscription, AFailingClassNameQueryReportsItsStatus)
     // Both queries report into the operation's status: the last one's
     // answer is what is returned.
     broker().faults().fail(BrokerCall::GetCharPtr, FaultMode::FailStatus);
-    const auto filter = host::IndicationFilter::forClass(restartEvent);
+    const auto filter = selclasses::filterFor(restartEvent);
     const host::Outcome outcome = host().activateFilter(filter, true);
     EXPECT_EQ(outcome.rc, CMPI_RC_ERR_FAILED);
     // It went on with the class name it got.
@@ -169,9 +170,9 @@ class PegasusOrder : public WatchdogSourceTest
     void SetUp() override
     {
         WatchdogSourceTest::SetUp();
-        host::HostOptions options;
+        host::HostOptions options = selclasses::hostOptions(SELPROV_LIBRARY);
         options.brokerPerMI = true;
-        host_ = std::make_unique<host::Host>(SELPROV_LIBRARY, options);
+        host_ = std::make_unique<host::Host>(std::move(options));
     }
 };
 
@@ -181,7 +182,7 @@ TEST_F(PegasusOrder, NoAuthorizationFirstAndLastAlwaysTrue)
     ASSERT_NE(host_->methodBroker(), host_->indicationBroker());
     host::IndicationInbox inbox = host_->listen(nameSpace);
     // Two filters on one class, each activated as the first.
-    auto entries = host::IndicationFilter::forClass(entryEvent);
+    auto entries = selclasses::filterFor(entryEvent);
     auto severe = entries;
     severe.query += " WHERE PerceivedSeverity > 2";
     ASSERT_EQ(host_->activateFilter(entries, true).rc, CMPI_RC_OK);

@@ -1,5 +1,6 @@
 #include "EntryFixture.h"
 #include "ProviderLibrary.h"
+#include "SelClasses.h"
 
 #include <dlfcn.h>
 #include <string>
@@ -33,7 +34,7 @@ TEST_F(Loading, LibraryCanBeLoadedUnloadedAndLoadedAgain)
 {
     for (int round = 0; round < 3; ++round)
     {
-        host::Host host(SELPROV_LIBRARY);
+        host::Host host(selclasses::hostOptions(SELPROV_LIBRARY));
         const auto outcome =
             host.enumerateInstances(classPath("ZAN_MgmtHwLogEntry"));
         EXPECT_EQ(outcome.rc, CMPI_RC_OK) << "round " << round;
@@ -44,7 +45,7 @@ TEST_F(Loading, LibraryCanBeLoadedUnloadedAndLoadedAgain)
 TEST_F(Loading, LibraryIsReallyUnloadedBetweenLoads)
 {
     {
-        host::Host host(SELPROV_LIBRARY);
+        host::Host host(selclasses::hostOptions(SELPROV_LIBRARY));
         EXPECT_EQ(host.enumerateInstanceNames(classPath("ZAN_MgmtHwLog"))
                       .paths.size(),
                   1u);
@@ -56,7 +57,7 @@ TEST_F(Loading, LibraryIsReallyUnloadedBetweenLoads)
     {
         ::dlclose(handle);
     }
-    host::Host again(SELPROV_LIBRARY);
+    host::Host again(selclasses::hostOptions(SELPROV_LIBRARY));
     EXPECT_EQ(
         again.enumerateInstanceNames(classPath("ZAN_MgmtHwLog")).paths.size(),
         1u);
@@ -72,7 +73,7 @@ TEST(LoadingErrors, MissingLibraryIsReported)
 TEST(LoadingErrors, WrongProviderNameFindsNoFactory)
 {
     host::ProviderLibrary library(SELPROV_LIBRARY, "OtherProvider");
-    host::Broker broker;
+    host::Broker broker{selclasses::schema()};
     EXPECT_THROW(library.createInstanceMI(broker.cmpi(), nullptr, nullptr),
                  std::runtime_error);
     EXPECT_EQ(library.symbol("OtherProvider_Create_InstanceMI"), nullptr);
@@ -92,7 +93,7 @@ TEST(ExportedSymbols, OnlyTheFactoriesAreVisible)
 
 TEST_F(Loading, TenThousandRequestsKeepWorking)
 {
-    host::Host host(SELPROV_LIBRARY);
+    host::Host host(selclasses::hostOptions(SELPROV_LIBRARY));
     host::ObjectPath path = classPath("ZAN_MgmtHwLog");
     path.keys.edit().push_back({"Name", host::Value::string("IPMI SEL Log")});
     path.keys.edit().push_back(

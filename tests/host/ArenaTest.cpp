@@ -1,4 +1,5 @@
 #include "Broker.h"
+#include "SelClasses.h"
 
 #include <cmpift.h>
 
@@ -58,7 +59,7 @@ long residentKiB()
 
 TEST(Arena, ObjectsInsideARequestAreNotTheBrokers)
 {
-    host::Broker broker;
+    host::Broker broker{selclasses::schema()};
     busyRequest(broker);
     EXPECT_EQ(broker.brokerOwnedObjects(), 0u);
     EXPECT_EQ(broker.outstandingClones(), 0u);
@@ -66,7 +67,7 @@ TEST(Arena, ObjectsInsideARequestAreNotTheBrokers)
 
 TEST(Arena, ObjectsOutsideRequestsBelongToTheBroker)
 {
-    host::Broker broker;
+    host::Broker broker{selclasses::schema()};
     const CMPIBroker* mb = broker.cmpi();
     mb->eft->newString(mb, "a", nullptr);
     mb->eft->newString(mb, "b", nullptr);
@@ -75,7 +76,7 @@ TEST(Arena, ObjectsOutsideRequestsBelongToTheBroker)
 
 TEST(Arena, UnreleasedClonesAreCountedAndFreedWithTheBroker)
 {
-    host::Broker broker;
+    host::Broker broker{selclasses::schema()};
     {
         host::Broker::Request request(broker);
         const CMPIBroker* mb = broker.cmpi();
@@ -90,7 +91,7 @@ TEST(Arena, UnreleasedClonesAreCountedAndFreedWithTheBroker)
 
 TEST(Arena, ClonesOutliveTheirRequest)
 {
-    host::Broker broker;
+    host::Broker broker{selclasses::schema()};
     CMPIString* kept = nullptr;
     {
         host::Broker::Request request(broker);
@@ -105,7 +106,7 @@ TEST(Arena, ClonesOutliveTheirRequest)
 
 TEST(Arena, TenThousandRequestsDoNotGrow)
 {
-    host::Broker broker;
+    host::Broker broker{selclasses::schema()};
     for (int i = 0; i < 1000; ++i)
     {
         busyRequest(broker);
@@ -129,7 +130,7 @@ TEST(Arena, TenThousandRequestsDoNotGrow)
 
 TEST(Arena, NestedRequestsOnOneThread)
 {
-    host::Broker broker;
+    host::Broker broker{selclasses::schema()};
     host::Broker::Request outer(broker);
     const CMPIBroker* mb = broker.cmpi();
     CMPIString* outerString = mb->eft->newString(mb, "outer", nullptr);
@@ -143,8 +144,8 @@ TEST(Arena, NestedRequestsOnOneThread)
 
 TEST(Arena, TwoBrokersKeepTheirOwnObjects)
 {
-    host::Broker first;
-    host::Broker second;
+    host::Broker first{selclasses::schema()};
+    host::Broker second{selclasses::schema()};
     host::Broker::Request request(first);
     const CMPIBroker* mb = second.cmpi();
     mb->eft->newString(mb, "second's", nullptr);

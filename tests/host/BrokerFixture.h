@@ -2,6 +2,7 @@
 #pragma once
 
 #include "Broker.h"
+#include "SelClasses.h"
 
 #include <cmpift.h>
 
@@ -68,7 +69,7 @@ class BrokerTest : public ::testing::Test
         return p ? p : "<null>";
     }
 
-    host::Broker broker_;
+    host::Broker broker_{selclasses::schema()};
     std::unique_ptr<host::Broker::Request> request_;
 };
 

@@ -1,6 +1,7 @@
 #include "Host.h"
 
 #include "ProviderLibrary.h"
+#include "SelClasses.h"
 
 #include <cmpift.h>
 
@@ -180,6 +181,15 @@ CMPIIndicationMI* createIndicationMI(const CMPIBroker*, const CMPIContext*,
 const host::ProviderFactories factories{createInstanceMI, createMethodMI,
                                         createIndicationMI};
 
+// A host over @p linked with the SEL provider's classes.
+host::HostOptions linkedProvider(const host::ProviderFactories& linked)
+{
+    host::HostOptions options;
+    options.factories = linked;
+    options.schema = selclasses::schema();
+    return options;
+}
+
 class HostTest : public ::testing::Test
 {
   protected:
@@ -191,7 +201,7 @@ class HostTest : public ::testing::Test
 
 TEST_F(HostTest, CreatesTheThreeMIs)
 {
-    host::Host h(factories);
+    host::Host h(linkedProvider(factories));
     EXPECT_EQ(h.instanceMI(), &instanceMI);
     EXPECT_EQ(h.methodMI(), &methodMI);
     EXPECT_EQ(h.indicationMI(), &indicationMI);
@@ -204,27 +214,27 @@ TEST_F(HostTest, CreatesTheThreeMIs)
 TEST_F(HostTest, NullMIIsALoadFailure)
 {
     recorder.factoryReturnsNull = true;
-    EXPECT_THROW(host::Host h(factories), host::LoadError);
+    EXPECT_THROW(host::Host h(linkedProvider(factories)), host::LoadError);
 }
 
 TEST_F(HostTest, FactoryErrorStatusIsALoadFailure)
 {
     recorder.factoryRc = CMPI_RC_ERR_FAILED;
-    EXPECT_THROW(host::Host h(factories), std::runtime_error);
+    EXPECT_THROW(host::Host h(linkedProvider(factories)), std::runtime_error);
 }
 
 TEST_F(HostTest, MissingFactoryIsALoadFailure)
 {
     host::ProviderFactories partial = factories;
     partial.method = nullptr;
-    EXPECT_THROW(host::Host h(partial), host::LoadError);
+    EXPECT_THROW(host::Host h(linkedProvider(partial)), host::LoadError);
     // The MI that did load was cleaned up.
     EXPECT_EQ(recorder.calls.back(), "cleanup(1)");
 }
 
 TEST_F(HostTest, EnumerateInstanceNames)
 {
-    host::Host h(factories);
+    host::Host h(linkedProvider(factories));
     const host::Outcome out = h.enumerateInstanceNames(
         host::ObjectPath::parse("root/zanqx:ZAN_MgmtHwLog"));
     EXPECT_EQ(out.rc, CMPI_RC_OK);
@@ -237,7 +247,7 @@ TEST_F(HostTest, EnumerateInstanceNames)
 
 TEST_F(HostTest, PropertyListsReachTheProvider)
 {
-    host::Host h(factories);
+    host::Host h(linkedProvider(factories));
     const auto reference = host::ObjectPath::parse("root/zanqx:ZAN_MgmtHwLog");
     h.enumerateInstances(reference);
     EXPECT_TRUE(recorder.sawNullProperties);
@@ -256,8 +266,8 @@ TEST_F(HostTest, PropertyListsReachTheProvider)
 
 TEST_F(HostTest, ErrorStatusAndMessage)
 {
-    host::Host h(factories);
-    const host::Schema schema = host::selSchema();
+    host::Host h(linkedProvider(factories));
+    const host::Schema schema = selclasses::schema();
     const host::Outcome out = h.getInstance(host::ObjectPath::parse(
         "root/zanqx:ZAN_MgmtHwLogEntry.RecordID=\"9\"", &schema));
     EXPECT_EQ(out.rc, CMPI_RC_ERR_NOT_FOUND);
@@ -269,7 +279,7 @@ TEST_F(HostTest, ErrorStatusAndMessage)
 
 TEST_F(HostTest, MissingSlotIsNotSupported)
 {
-    host::Host h(factories);
+    host::Host h(linkedProvider(factories));
     const host::Outcome out =
         h.deleteInstance(host::ObjectPath::parse("root:C.K=1"));
     EXPECT_EQ(out.rc, CMPI_RC_ERR_NOT_SUPPORTED);
@@ -277,7 +287,7 @@ TEST_F(HostTest, MissingSlotIsNotSupported)
 
 TEST_F(HostTest, InvokeMethod)
 {
-    host::Host h(factories);
+    host::Host h(linkedProvider(factories));
     const host::Outcome out = h.invokeMethod(
         host::ObjectPath::parse("root/zanqx:ZAN_MgmtHwLog.Name=\"IPMI SEL\""),
         "ClearLog");
@@ -292,7 +302,7 @@ TEST_F(HostTest, InvokeMethod)
 TEST_F(HostTest, DestructionDisablesAndCleansUp)
 {
     {
-        host::Host h(factories);
+        host::Host h(linkedProvider(factories));
         EXPECT_EQ(h.enableIndications().rc, CMPI_RC_OK);
         recorder.calls.clear();
     }
@@ -304,7 +314,7 @@ TEST_F(HostTest, DestructionDisablesAndCleansUp)
 TEST_F(HostTest, CleanupAllOnlyOnceWhenTerminating)
 {
     {
-        host::Host h(factories);
+        host::Host h(linkedProvider(factories));
         EXPECT_EQ(h.cleanupAll(false).rc, CMPI_RC_OK);
         EXPECT_EQ(h.cleanupAll(true).rc, CMPI_RC_OK);
         recorder.calls.clear();
@@ -314,7 +324,7 @@ TEST_F(HostTest, CleanupAllOnlyOnceWhenTerminating)
 
 TEST_F(HostTest, RequestsLeaveNothingBehind)
 {
-    host::Host h(factories);
+    host::Host h(linkedProvider(factories));
     for (int i = 0; i < 100; ++i)
     {
         h.enumerateInstances(host::ObjectPath::parse("root:ZAN_MgmtHwLog"));
@@ -334,7 +344,8 @@ TEST(ProviderLibrary, MissingLibraryIsARuntimeError)
     {
         EXPECT_NE(std::string(e.what()).find("libNope.so"), std::string::npos);
     }
-    EXPECT_THROW(host::Host("/nonexistent/libNope.so"), std::runtime_error);
+    EXPECT_THROW(host::Host(selclasses::hostOptions("/nonexistent/libNope.so")),
+                 std::runtime_error);
 }
 
 TEST(ProviderLibrary, LibraryWithoutFactoriesFails)
@@ -342,7 +353,7 @@ TEST(ProviderLibrary, LibraryWithoutFactoriesFails)
     host::ProviderLibrary lib("libm.so.6", "SELProvider");
     EXPECT_NE(lib.symbol("cos"), nullptr);
     EXPECT_EQ(lib.symbol("SELProvider_Create_InstanceMI"), nullptr);
-    host::Broker broker;
+    host::Broker broker{selclasses::schema()};
     host::Broker::Request request(broker);
     CMPIStatus rc{CMPI_RC_OK, nullptr};
     try
@@ -355,7 +366,8 @@ TEST(ProviderLibrary, LibraryWithoutFactoriesFails)
         EXPECT_NE(std::string(e.what()).find("SELProvider_Create_InstanceMI"),
                   std::string::npos);
     }
-    EXPECT_THROW(host::Host("libm.so.6"), host::LoadError);
+    EXPECT_THROW(host::Host(selclasses::hostOptions("libm.so.6")),
+                 host::LoadError);
 }
 
 } // namespace

@@ -3,6 +3,7 @@
 // MI factory gets.
 #include "BrokerFixture.h"
 #include "Host.h"
+#include "SelClasses.h"
 
 #include <cmpift.h>
 
@@ -155,16 +156,17 @@ class IndicationHostTest : public ::testing::Test
     void SetUp() override
     {
         provider = Provider{};
-        host_ = std::make_unique<host::Host>(host::ProviderFactories{
-            makeInstanceMI, makeMethodMI, makeIndicationMI});
+        host::HostOptions options;
+        options.factories = {makeInstanceMI, makeMethodMI, makeIndicationMI};
+        options.schema = selclasses::schema();
+        host_ = std::make_unique<host::Host>(std::move(options));
     }
     std::unique_ptr<host::Host> host_;
 };
 
 TEST_F(IndicationHostTest, FilterOperationsHandTheQueryAsASelectExpression)
 {
-    const auto filter =
-        host::IndicationFilter::forClass("ZAN_MgmtHwLogClearEvent");
+    const auto filter = selclasses::filterFor("ZAN_MgmtHwLogClearEvent");
     EXPECT_EQ(filter.query, "SELECT * FROM ZAN_MgmtHwLogClearEvent");
     EXPECT_EQ(host_->authorizeFilter(filter, "root").rc, CMPI_RC_OK);
     EXPECT_EQ(host_->mustPoll(filter).rc, CMPI_RC_OK);
@@ -201,7 +203,7 @@ TEST_F(IndicationHostTest, EveryFactoryGetsTheSameBrokerByDefault)
 
 TEST(IndicationHost, BrokerViewsAreDistinctPointersOverOneBroker)
 {
-    host::Broker broker;
+    host::Broker broker{selclasses::schema()};
     std::vector<const CMPIBroker*> views;
     for (std::size_t i = 0; i < host::Broker::viewCount; ++i)
     {

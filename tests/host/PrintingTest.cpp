@@ -31,7 +31,7 @@ host::Instance sample()
 
 TEST(Printing, Mof)
 {
-    EXPECT_EQ(host::formatMof(sample()),
+    EXPECT_EQ(selprov::formatMof(sample()),
               "// root/zanqx:ZAN_MgmtHwLogEntry.CreationClassName="
               "\"ZAN_MgmtHwLogEntry\",RecordID=\"1\"\n"
               "instance of ZAN_MgmtHwLogEntry\n"
@@ -47,7 +47,7 @@ TEST(Printing, Mof)
 
 TEST(Printing, JsonInstance)
 {
-    EXPECT_EQ(host::jsonInstance(sample()),
+    EXPECT_EQ(selprov::jsonInstance(sample()),
               "{\"path\": \"root/zanqx:ZAN_MgmtHwLogEntry.CreationClassName="
               "\\\"ZAN_MgmtHwLogEntry\\\",RecordID=\\\"1\\\"\", "
               "\"properties\": {\"CreationClassName\": "
@@ -58,35 +58,35 @@ TEST(Printing, JsonInstance)
 
 TEST(Printing, JsonEscaping)
 {
-    EXPECT_EQ(host::jsonString("q\" b\\ \n\r\t\b\f"),
+    EXPECT_EQ(selprov::jsonString("q\" b\\ \n\r\t\b\f"),
               "\"q\\\" b\\\\ \\n\\r\\t\\b\\f\"");
-    EXPECT_EQ(host::jsonString(std::string("\x01\x1f\x7f", 3)),
+    EXPECT_EQ(selprov::jsonString(std::string("\x01\x1f\x7f", 3)),
               "\"\\u0001\\u001f\\u007f\"");
-    EXPECT_EQ(host::jsonString("caf\xc3\xa9 \xe2\x82\xac"),
+    EXPECT_EQ(selprov::jsonString("caf\xc3\xa9 \xe2\x82\xac"),
               "\"caf\xc3\xa9 \xe2\x82\xac\""); // valid UTF-8 kept
-    EXPECT_EQ(host::jsonString("bad \xff \xc3"), "\"bad \\ufffd \\ufffd\"");
-    EXPECT_EQ(host::jsonString("\xed\xa0\x80"), // a surrogate
+    EXPECT_EQ(selprov::jsonString("bad \xff \xc3"), "\"bad \\ufffd \\ufffd\"");
+    EXPECT_EQ(selprov::jsonString("\xed\xa0\x80"), // a surrogate
               "\"\\ufffd\\ufffd\\ufffd\"");
-    EXPECT_EQ(host::jsonString(std::string("a\0b", 3)), "\"a\\u0000b\"");
+    EXPECT_EQ(selprov::jsonString(std::string("a\0b", 3)), "\"a\\u0000b\"");
 }
 
 TEST(Printing, JsonNumbers)
 {
-    EXPECT_EQ(host::jsonValue(Value::signedInt(CMPI_sint64, -5)), "-5");
-    EXPECT_EQ(host::jsonValue(
+    EXPECT_EQ(selprov::jsonValue(Value::signedInt(CMPI_sint64, -5)), "-5");
+    EXPECT_EQ(selprov::jsonValue(
                   Value::unsignedInt(CMPI_uint64, 18446744073709551615ull)),
               "18446744073709551615");
-    EXPECT_EQ(host::jsonValue(Value::real(CMPI_real64, 0.25)), "0.25");
-    EXPECT_EQ(host::jsonValue(Value::real(CMPI_real64, 1.0 / 0.0)), "null");
+    EXPECT_EQ(selprov::jsonValue(Value::real(CMPI_real64, 0.25)), "0.25");
+    EXPECT_EQ(selprov::jsonValue(Value::real(CMPI_real64, 1.0 / 0.0)), "null");
 }
 
 TEST(Printing, JsonLists)
 {
-    EXPECT_EQ(host::jsonInstances({}), "[]\n");
+    EXPECT_EQ(selprov::jsonInstances({}), "[]\n");
     host::ObjectPath p;
     p.nameSpace = "root";
     p.className = "C";
-    EXPECT_EQ(host::jsonPaths({p, p}), "[\"root:C\",\n \"root:C\"]\n");
+    EXPECT_EQ(selprov::jsonPaths({p, p}), "[\"root:C\",\n \"root:C\"]\n");
 }
 
 TEST(StatusText, Describe)

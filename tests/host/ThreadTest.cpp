@@ -1,4 +1,5 @@
 #include "BrokerFixture.h"
+#include "SelClasses.h"
 
 #include <atomic>
 #include <ctime>
@@ -201,7 +202,7 @@ TEST_F(ThreadTest, DeliverIndicationChecksArguments)
 
 TEST(ConcurrentRequests, ManyThreadsUseOneBroker)
 {
-    host::Broker broker;
+    host::Broker broker{selclasses::schema()};
     std::vector<std::thread> threads;
     threads.reserve(8);
     std::atomic<int> failures{0};

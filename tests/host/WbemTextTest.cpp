@@ -1,4 +1,5 @@
 #include "Schema.h"
+#include "SelClasses.h"
 #include "Values.h"
 
 #include <stdexcept>
@@ -75,7 +76,7 @@ TEST(WbemText, RoundTrips)
 
 TEST(WbemText, SchemaGivesKeyTypes)
 {
-    const host::Schema schema = host::selSchema();
+    const host::Schema schema = selclasses::schema();
     const ObjectPath p = ObjectPath::parse(
         "root/zanqx:ZAN_MgmtHwLogEntry.RecordID=\"3\","
         "MessageTimestamp=\"20080523044811.000000+000\",Other=\"o\"",
@@ -190,7 +191,7 @@ TEST(Values, ToString)
 
 TEST(Schema, FindsClassesWithoutCase)
 {
-    const host::Schema schema = host::selSchema();
+    const host::Schema schema = selclasses::schema();
     const host::ClassKeys* log = schema.find("zan_mgmthwlog");
     ASSERT_NE(log, nullptr);
     EXPECT_EQ(log->keys.size(), 2u);

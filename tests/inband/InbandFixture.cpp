@@ -2,6 +2,7 @@
 
 #include "CVLogger.h"
 #include "Platform.h"
+#include "SelClasses.h"
 #include "SelRequests.h"
 #include "SystemEventRecord.h"
 #include "ipmi/ExchangeWorker.h"
@@ -67,7 +68,8 @@ void InbandTest::loadWith(const std::string& settings)
         ::setenv(QX::Platform::configurationPathVariable, file.c_str(), 1), 0);
     // The platform makes its source from the file at first use.
     QX::Platform::overrideSource(nullptr);
-    host_ = std::make_unique<host::Host>(SELPROV_LIBRARY);
+    host_ =
+        std::make_unique<host::Host>(selclasses::hostOptions(SELPROV_LIBRARY));
 }
 
 void InbandTest::unload()

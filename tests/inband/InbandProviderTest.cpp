@@ -4,6 +4,7 @@
 
 #include "EventClasses.h"
 #include "InbandFixture.h"
+#include "SelClasses.h"
 
 #include <chrono>
 #include <thread>
@@ -79,7 +80,7 @@ TEST_F(InbandTest, AddedRecordGivesOneEntryEvent)
     addRecords(2);
     load();
     host::IndicationInbox inbox = host().listen("root/zanqx");
-    const auto filter = host::IndicationFilter::forClass(entryEvent);
+    const auto filter = selclasses::filterFor(entryEvent);
     ASSERT_EQ(host().authorizeFilter(filter, "root").rc, CMPI_RC_OK);
     ASSERT_EQ(host().mustPoll(filter).rc, CMPI_RC_OK);
     ASSERT_EQ(host().activateFilter(filter, true).rc, CMPI_RC_OK);

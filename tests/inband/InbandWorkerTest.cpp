@@ -3,6 +3,7 @@
 // serves every exchange of a session, and none outlives an unload.
 
 #include "InbandFixture.h"
+#include "SelClasses.h"
 
 #include <atomic>
 #include <chrono>
@@ -109,8 +110,7 @@ TEST_F(InbandTest, NoWorkerOutlivesAnUnloadWithIndicationsEnabled)
 {
     addRecords(3);
     load(1000, 100);
-    const auto filter =
-        host::IndicationFilter::forClass("ZAN_MgmtHwLogEntryEvent");
+    const auto filter = selclasses::filterFor("ZAN_MgmtHwLogEntryEvent");
     ASSERT_EQ(host().activateFilter(filter, true).rc, CMPI_RC_OK);
     ASSERT_EQ(host().enableIndications().rc, CMPI_RC_OK);
     const auto deadline = Clock::now() + patience;

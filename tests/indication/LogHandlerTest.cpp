@@ -6,6 +6,7 @@
 #include "Indication.h"
 #include "Resources.h"
 #include "SELIndication.h"
+#include "SelClasses.h"
 #include "Support.h"
 
 #include <chrono>
@@ -71,7 +72,7 @@ class LogHandlerTest : public ::testing::Test
         return delivered;
     }
 
-    host::Broker broker;
+    host::Broker broker{selclasses::schema()};
     host::IndicationInbox inbox = broker.listen("root/zanqx");
     host::Broker::Request request{broker};
 

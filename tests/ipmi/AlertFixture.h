@@ -7,6 +7,7 @@
 #include "BmcFixture.h"
 #include "EventClasses.h"
 #include "IndicationInbox.h"
+#include "SelClasses.h"
 #include "SystemEventRecord.h"
 #include "ipmi/IpmiSource.h"
 
@@ -103,7 +104,7 @@ class AlertTest : public BmcTest
      *  indications, and waits until the poller has looked at the BMC. */
     void subscribe(const std::string& className)
     {
-        const auto filter = host::IndicationFilter::forClass(className);
+        const auto filter = selclasses::filterFor(className);
         ASSERT_EQ(host().authorizeFilter(filter, "root").rc, CMPI_RC_OK);
         ASSERT_EQ(host().mustPoll(filter).rc, CMPI_RC_OK);
         ASSERT_EQ(host().activateFilter(filter, true).rc, CMPI_RC_OK);

@@ -2,6 +2,7 @@
 
 #include "CVLogger.h"
 #include "Platform.h"
+#include "SelClasses.h"
 #include "SelRequests.h"
 #include "ipmi/IpmiSourceFactory.h"
 
@@ -65,7 +66,8 @@ void BmcTest::startProvider(unsigned timeoutMs)
 {
     source = QX::Ipmi::makeIpmiSource(settings(timeoutMs), "");
     QX::Platform::overrideSource(source);
-    host_ = std::make_unique<host::Host>(SELPROV_LIBRARY);
+    host_ =
+        std::make_unique<host::Host>(selclasses::hostOptions(SELPROV_LIBRARY));
 }
 
 host::Outcome BmcTest::enumerate(const std::string& className)

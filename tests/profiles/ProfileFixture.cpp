@@ -2,6 +2,7 @@
 
 #include "CVLogger.h"
 #include "Platform.h"
+#include "SelClasses.h"
 #include "SelRequests.h"
 #include "ipmi/SelRecord.h"
 
@@ -57,7 +58,8 @@ void ProfileTest::load()
         std::move(ownedDescriber), settings, "Simulated BMC", alertStateFile,
         selCopy);
     QX::Platform::overrideSource(source);
-    host_ = std::make_unique<host::Host>(SELPROV_LIBRARY);
+    host_ =
+        std::make_unique<host::Host>(selclasses::hostOptions(SELPROV_LIBRARY));
     inbox =
         std::make_unique<host::IndicationInbox>(host_->listen("root/zanqx"));
 }
@@ -89,7 +91,7 @@ void ProfileTest::subscribeAll()
 {
     for (const char* className : {entryEvent, clearEvent, fullEvent})
     {
-        const auto filter = host::IndicationFilter::forClass(className);
+        const auto filter = selclasses::filterFor(className);
         ASSERT_EQ(host_->authorizeFilter(filter, "root").rc, CMPI_RC_OK);
         ASSERT_EQ(host_->mustPoll(filter).rc, CMPI_RC_OK);
         ASSERT_EQ(host_->activateFilter(filter, true).rc, CMPI_RC_OK);

@@ -1,5 +1,6 @@
 #include "Broker.h"
 #include "SELObjectFactory.h"
+#include "SelClasses.h"
 #include "TestSupport.h"
 
 #include <vector>
@@ -34,7 +35,7 @@ class Builders : public PlatformTest
     {
         return broker_;
     }
-    host::Broker broker_;
+    host::Broker broker_{selclasses::schema()};
 
     host::Instance build(const char* className, const char** properties,
                          bool keysOnly, CMPIStatus* status = nullptr)
@@ -181,7 +182,7 @@ class Collection : public PlatformTest
         return copies;
     }
 
-    host::Broker broker_;
+    host::Broker broker_{selclasses::schema()};
     unsigned lastResult_ = 0;
 };
 

@@ -3,6 +3,7 @@
 #include "Broker.h"
 #include "Indication.h"
 #include "SELIndication.h"
+#include "SelClasses.h"
 #include "TestSupport.h"
 
 #include <chrono>
@@ -223,7 +224,7 @@ TEST_F(Registry, EachClassStartsItsWatchWithItsHandler)
 
 TEST_F(Registry, UnsubscribingNeverReachesZero)
 {
-    host::Broker broker;
+    host::Broker broker{selclasses::schema()};
     const int context = 0;
     saveSELIndicationContext(broker.cmpi(),
                              reinterpret_cast<const CMPIContext*>(&context));
@@ -243,7 +244,7 @@ TEST_F(Registry, UnsubscribingNeverReachesZero)
 
 TEST_F(Registry, UnsubscribingWithEveryCounterAtZeroClearsTheContext)
 {
-    host::Broker broker;
+    host::Broker broker{selclasses::schema()};
     saveSELIndicationContext(broker.cmpi(), nullptr);
     unsubscribeForSELIndication(15);
     EXPECT_FALSE(_alertSELContextAvailable);
@@ -253,7 +254,7 @@ TEST_F(Registry, UnsubscribingWithEveryCounterAtZeroClearsTheContext)
 
 TEST_F(Registry, UnsubscribingAClassAtZeroWrapsAndKeepsTheContext)
 {
-    host::Broker broker;
+    host::Broker broker{selclasses::schema()};
     saveSELIndicationContext(broker.cmpi(), nullptr);
     unsubscribeForSELIndication(3);
     EXPECT_EQ(subscriberCountLogClearIndication, 4294967295u);
@@ -334,7 +335,7 @@ class AlertHandlers : public Registry
         return broker.faults().calls(host::BrokerCall::NewThread);
     }
 
-    host::Broker broker;
+    host::Broker broker{selclasses::schema()};
     std::unique_ptr<host::Broker::Request> request;
 };
 

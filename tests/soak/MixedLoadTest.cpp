@@ -2,6 +2,7 @@
 // 1,000 simulated alerts fire and another thread keeps subscribing,
 // enabling, disabling and unsubscribing.
 #include "CVLogger.h"
+#include "SelClasses.h"
 #include "SoakSupport.h"
 #include "entry/EntryFixture.h"
 
@@ -325,14 +326,13 @@ void MixedLoad::churnSubscriptions(host::Host& host,
         {
             if ((mask & (1u << bit)) != 0)
             {
-                filters.push_back(
-                    host::IndicationFilter::forClass(churnedClasses[bit]));
+                filters.push_back(selclasses::filterFor(churnedClasses[bit]));
             }
         }
         const bool likeSfcb = cycle % 4 == 3;
         if (cycle + 8 >= subscriptionCycles)
         {
-            filters.push_back(host::IndicationFilter::forClass(clearEvent));
+            filters.push_back(selclasses::filterFor(clearEvent));
         }
         for (const auto& filter : filters)
         {
@@ -402,7 +402,7 @@ TEST_F(MixedLoad, RequestsAlertsAndSubscriptionsAtOnce)
     const auto start = std::chrono::steady_clock::now();
     std::size_t delivered = 0;
     {
-        host::Host host(SELPROV_LIBRARY);
+        host::Host host(selclasses::hostOptions(SELPROV_LIBRARY));
         host::IndicationInbox inbox = host.listen(nameSpace);
         std::vector<std::thread> threads;
         threads.reserve(requestThreads + 2);

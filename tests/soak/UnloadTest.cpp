@@ -2,6 +2,7 @@
 // and alerts in flight, in an object manager's unload order: cleanup, then
 // dlclose, without disabling indications first.
 #include "CVLogger.h"
+#include "SelClasses.h"
 #include "SoakSupport.h"
 #include "entry/EntryFixture.h"
 
@@ -58,12 +59,12 @@ TEST_F(Unload, HundredUnloadsWithSubscriptionsAndAlertsInFlight)
     for (int round = 0; round < rounds; ++round)
     {
         {
-            host::Host host(SELPROV_LIBRARY);
+            host::Host host(selclasses::hostOptions(SELPROV_LIBRARY));
             host::IndicationInbox inbox = host.listen(nameSpace);
             for (const char* className :
                  {entryEvent, clearEvent, fullEvent, restartEvent})
             {
-                const auto filter = host::IndicationFilter::forClass(className);
+                const auto filter = selclasses::filterFor(className);
                 ASSERT_EQ(host.activateFilter(filter, true).rc, CMPI_RC_OK);
                 // Every other round a second subscription of the class,
                 // which disabling would not end.

@@ -1,4 +1,5 @@
-// Human (MOF-like) and machine (JSON) renderings of provider results.
+// Human (MOF-like) and machine (JSON) renderings of provider results, as
+// selprov prints them.
 #pragma once
 
 #include "Values.h"
@@ -7,20 +8,20 @@
 #include <string_view>
 #include <vector>
 
-namespace host
+namespace selprov
 {
 
 // "// path\ninstance of Class\n{\n    Name = value;\n};\n"
-std::string formatMof(const Instance& instance);
+std::string formatMof(const host::Instance& instance);
 
 // A JSON string literal; invalid UTF-8 bytes become U+FFFD.
 std::string jsonString(std::string_view text);
 // Numbers as numbers (non-finite reals as null), strings and datetimes as
 // strings, references as their path text, arrays as arrays.
-std::string jsonValue(const Value& value);
+std::string jsonValue(const host::Value& value);
 // {"path": "...", "properties": {"Name": value, ...}}
-std::string jsonInstance(const Instance& instance);
-std::string jsonInstances(const std::vector<Instance>& instances);
-std::string jsonPaths(const std::vector<ObjectPath>& paths);
+std::string jsonInstance(const host::Instance& instance);
+std::string jsonInstances(const std::vector<host::Instance>& instances);
+std::string jsonPaths(const std::vector<host::ObjectPath>& paths);
 
-} // namespace host
+} // namespace selprov

@@ -5,8 +5,12 @@
 #include <cmath>
 #include <cstdio>
 
-namespace host
+namespace selprov
 {
+
+using host::Instance;
+using host::ObjectPath;
+using host::Value;
 
 std::string formatMof(const Instance& instance)
 {
@@ -172,7 +176,7 @@ std::string jsonValue(const Value& value)
         case CMPI_real32:
         case CMPI_real64:
             return std::isfinite(value.realValue())
-                       ? realText(value.realValue())
+                       ? host::realText(value.realValue())
                        : "null";
         case CMPI_string:
         case CMPI_dateTime:
@@ -216,4 +220,4 @@ std::string jsonPaths(const std::vector<ObjectPath>& paths)
     return out + "]\n";
 }
 
-} // namespace host
+} // namespace selprov
