@@ -12,7 +12,7 @@
  *   log.components = * | name[,name...]
  *   locale         = en | de         (empty: the process environment)
  */
-#include "Platform.h"
+#include "Configuration.h"
 
 #include <cerrno>
 #include <cstdlib>

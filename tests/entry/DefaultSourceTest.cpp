@@ -4,6 +4,7 @@
 // data (never the built-in sample) and one line says what is missing. A
 // platform that cannot be set up at all fails a subscription's watch with
 // a line in the log as well.
+#include "Configuration.h"
 #include "EntryFixture.h"
 
 #include <cstdlib>
