@@ -2,10 +2,10 @@
 
 #include "CVLogger.h"
 #include "DeployFiles.h"
+#include "EntryFixture.h"
 #include "MemorySource.h"
 #include "NodeTree.h"
 #include "Platform.h"
-#include "entry/EntryFixture.h"
 
 namespace deploy
 {

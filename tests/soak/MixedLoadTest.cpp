@@ -2,8 +2,8 @@
 // 1,000 simulated alerts fire and another thread keeps subscribing,
 // enabling, disabling and unsubscribing.
 #include "CVLogger.h"
+#include "EntryFixture.h"
 #include "SoakSupport.h"
-#include "entry/EntryFixture.h"
 
 #include <atomic>
 #include <chrono>

@@ -2,8 +2,8 @@
 // counters, the watches they start and stop, and the saved context.
 #include "Broker.h"
 #include "Indication.h"
+#include "PlatformFixture.h"
 #include "SELIndication.h"
-#include "TestSupport.h"
 
 #include <chrono>
 #include <cstdint>

@@ -1,6 +1,6 @@
 #include "Broker.h"
+#include "PlatformFixture.h"
 #include "SELObjectFactory.h"
-#include "TestSupport.h"
 
 #include <vector>
 
