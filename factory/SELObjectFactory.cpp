@@ -7,11 +7,11 @@
 namespace QX::SELComposite
 {
 
-std::string loggerSELObjectFactory = "Corvane.SELProvider";
-
 namespace
 {
 
+/** The file name the factory's trace lines give, whatever this file is
+ *  called. */
 constexpr const char* unitFile = "SELObjectFactory.cpp";
 
 /** Scratch size of the factory's own datetime conversion. */

@@ -9,13 +9,16 @@
 
 #include <cstdint>
 #include <string>
+#include <string_view>
 #include <vector>
 
 namespace QX::SELComposite
 {
 
-/** Logger component of the object factory. */
-extern std::string loggerSELObjectFactory;
+/** Logger component of the object factory. A constant, not a string object:
+ * threads still tracing while the library's statics are destroyed read it. */
+inline constexpr std::string_view loggerSELObjectFactory =
+    "Corvane.SELProvider";
 
 /** CIM classes the factory serves. */
 constexpr const char* LOG_CLASS_NAME = "ZAN_MgmtHwLog";

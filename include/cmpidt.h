@@ -20,26 +20,23 @@
 #define CMPI_VERSION 200
 #endif
 
-#if CMPI_VERSION == 200
-#define CMPI_VER_200 1
-#define CMPI_VER_100 1
-#define CMPI_VER_90 1
-#define CMPI_VER_87 1
-#define CMPI_VER_86 1
-#define CMPI_VER_85 1
-#define CMPI_VER_80 1
-#define CMPICurrentVersion CMPIVersion200
-#elif CMPI_VERSION == 100
-#define CMPI_VER_100 1
-#define CMPI_VER_90 1
-#define CMPI_VER_87 1
-#define CMPI_VER_86 1
-#define CMPI_VER_85 1
-#define CMPI_VER_80 1
-#define CMPICurrentVersion CMPIVersion100
-#else
+#if CMPI_VERSION != 200 && CMPI_VERSION != 100
 #error "Unsupported CMPI_VERSION: use 100 or 200"
 #endif
+
+/* Each version also provides everything of the versions before it. */
+#if CMPI_VERSION == 200
+#define CMPI_VER_200 1
+#define CMPICurrentVersion CMPIVersion200
+#else
+#define CMPICurrentVersion CMPIVersion100
+#endif
+#define CMPI_VER_100 1
+#define CMPI_VER_90 1
+#define CMPI_VER_87 1
+#define CMPI_VER_86 1
+#define CMPI_VER_85 1
+#define CMPI_VER_80 1
 
 /* clang-format off */
 #ifdef __cplusplus

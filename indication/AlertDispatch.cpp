@@ -41,51 +41,45 @@ void reportEscaped(const char* function, const std::exception* error) noexcept
 }
 
 /**
- * The record an alert handler put into the hand-over slot: unless the
- * thread it starts takes it, the slot is freed again when this goes.
+ * The record an alert handler holds in the hand-over, from filling it
+ * until its delivery thread has delivered (or never started): the record
+ * is let go when this goes, however the handler ends.
  */
-class PendingHandOver
+class HeldRecord
 {
   public:
-    explicit PendingHandOver(AlertHandOver::Ticket ticket) : ticket_(ticket) {}
-    ~PendingHandOver()
+    HeldRecord(const DateTime& time, const std::string& nodePath) :
+        ticket_(indicationSELData.put(time, nodePath))
     {
-        if (!started_)
-        {
-            indicationSELData.withdraw(ticket_);
-        }
     }
-    PendingHandOver(const PendingHandOver&) = delete;
-    PendingHandOver& operator=(const PendingHandOver&) = delete;
+    ~HeldRecord()
+    {
+        indicationSELData.release(ticket_);
+    }
+    HeldRecord(const HeldRecord&) = delete;
+    HeldRecord& operator=(const HeldRecord&) = delete;
 
-    void threadStarted()
+    /** Waits (bounded) until its delivery thread has delivered. */
+    void awaitDelivered() const
     {
-        started_ = true;
-    }
-    void awaitTaken()
-    {
-        indicationSELData.awaitTaken(ticket_);
+        indicationSELData.awaitDelivered(ticket_);
     }
 
   private:
     AlertHandOver::Ticket ticket_;
-    bool started_ = false;
 };
 
-/** Marks a delivery thread's ticket finished however its handler ends. */
-class Turn
+/** Reports a delivery thread's alert delivered however its handler ends. */
+class DeliveryReport
 {
   public:
-    explicit Turn(AlertHandOver::Ticket ticket) : ticket_(ticket)
+    explicit DeliveryReport(AlertHandOver::Ticket ticket) : ticket_(ticket) {}
+    ~DeliveryReport()
     {
-        indicationSELData.awaitTurn(ticket_);
+        indicationSELData.delivered(ticket_);
     }
-    ~Turn()
-    {
-        indicationSELData.finish(ticket_);
-    }
-    Turn(const Turn&) = delete;
-    Turn& operator=(const Turn&) = delete;
+    DeliveryReport(const DeliveryReport&) = delete;
+    DeliveryReport& operator=(const DeliveryReport&) = delete;
 
   private:
     AlertHandOver::Ticket ticket_;
@@ -103,7 +97,7 @@ void startDeliveryThread(const AlertChain& chain, const DateTime& time,
         // Nothing saved to reach the object manager through.
         return;
     }
-    PendingHandOver pending(indicationSELData.put(time, nodePath));
+    const HeldRecord held(time, nodePath);
     // A broker dereferences the context it is given: never hand it null.
     CMPIContext* const context =
         saved != nullptr ? broker->bft->prepareAttachThread(broker, saved)
@@ -118,11 +112,7 @@ void startDeliveryThread(const AlertChain& chain, const DateTime& time,
         handle = broker->xft != nullptr
                      ? broker->xft->newThread(chain.threadBody, nullptr, 1)
                      : nullptr;
-        if (handle != nullptr)
-        {
-            pending.threadStarted();
-        }
-        else
+        if (handle == nullptr)
         {
             indicationActivity.threadNotStarted();
         }
@@ -138,7 +128,9 @@ void startDeliveryThread(const AlertChain& chain, const DateTime& time,
                      "Error creating thread");
         return;
     }
-    pending.awaitTaken();
+    // Alerts come one after another from the source's dispatcher thread:
+    // waiting here for this delivery keeps the indications in that order.
+    held.awaitDelivered();
 }
 
 void runAlertHandler(const AlertChain& chain, unsigned int alertCode,
@@ -181,7 +173,7 @@ void runDeliveryThread(const char* name,
         traceEntry(name, __LINE__);
         auto [record, ticket] = indicationSELData.take();
         {
-            const Turn turn(ticket);
+            const DeliveryReport report(ticket);
             deliveryHandler(record.time, std::move(record.nodePath));
         }
         traceExit(name, __LINE__);
@@ -341,11 +333,16 @@ void LogEntryHandler(DateTime time, std::string nodePath)
 
 void LogHandler(DateTime time, std::string nodePath)
 {
+    handleLogAlert(time, std::move(nodePath), &getLogInstrumentation);
+}
+
+void handleLogAlert(DateTime time, std::string nodePath, LogReader read)
+{
     constexpr const char* function = "LogHandler";
     traceEntry(function, __LINE__);
     std::string logPath;
     std::string condition;
-    if (getLogInstrumentation(nodePath, logPath, condition))
+    if (read(nodePath, logPath, condition))
     {
         traceVariable(function, __LINE__, "message", condition.c_str());
         if (_alertSELContextAvailable.load())

@@ -1,5 +1,7 @@
 #include "AlertHandOver.h"
 
+#include <algorithm>
+
 namespace QX::SELComposite
 {
 
@@ -7,111 +9,47 @@ AlertHandOver::Ticket AlertHandOver::put(const DateTime& time,
                                          const std::string& nodePath)
 {
     std::unique_lock lock(mutex_);
-    changed_.wait_for(lock, handOverWait, [this] { return !full_; });
-    if (full_)
-    {
-        // Its thread never came for it: the record is overwritten and
-        // that ticket will not be delivered on its own.
-        finishLocked(written_);
-    }
+    // Only handlers called on different threads meet here; past the wait
+    // the record is taken over from the handler that still holds it.
+    changed_.wait_for(lock, handOverWait, [this] { return !held_; });
     record_ = AlertRecord{time, nodePath};
-    full_ = true;
+    held_ = true;
     return ++written_;
 }
 
-bool AlertHandOver::awaitTaken(Ticket ticket)
+bool AlertHandOver::awaitDelivered(Ticket ticket)
 {
     std::unique_lock lock(mutex_);
-    return changed_.wait_for(lock, handOverWait,
-                             [this, ticket] { return taken_ >= ticket; });
+    return changed_.wait_for(lock, deliveryWait,
+                             [this, ticket] { return delivered_ >= ticket; });
 }
 
-void AlertHandOver::withdraw(Ticket ticket)
+void AlertHandOver::release(Ticket ticket)
 {
     {
         const std::lock_guard lock(mutex_);
-        if (full_ && written_ == ticket)
+        if (written_ != ticket)
         {
-            full_ = false;
+            return;
         }
-        finishLocked(ticket);
+        held_ = false;
     }
     changed_.notify_all();
 }
 
-std::pair<AlertRecord, AlertHandOver::Ticket> AlertHandOver::take()
+std::pair<AlertRecord, AlertHandOver::Ticket> AlertHandOver::take() const
 {
-    std::pair<AlertRecord, Ticket> copy;
-    {
-        const std::lock_guard lock(mutex_);
-        copy = {record_, written_};
-        full_ = false;
-        taken_ = written_;
-    }
-    changed_.notify_all();
-    return copy;
+    const std::lock_guard lock(mutex_);
+    return {record_, written_};
 }
 
-void AlertHandOver::awaitTurn(Ticket ticket)
-{
-    std::unique_lock lock(mutex_);
-    if (changed_.wait_for(lock, turnWait,
-                          [this, ticket] { return finished_ + 1 >= ticket; }))
-    {
-        return;
-    }
-    // A thread before this one is stuck: stop waiting for it, here and in
-    // every thread after this one.
-    skipTo(ticket - 1);
-    lock.unlock();
-    changed_.notify_all();
-}
-
-void AlertHandOver::finish(Ticket ticket)
+void AlertHandOver::delivered(Ticket ticket)
 {
     {
         const std::lock_guard lock(mutex_);
-        finishLocked(ticket);
+        delivered_ = std::max(delivered_, ticket);
     }
     changed_.notify_all();
-}
-
-void AlertHandOver::finishLocked(Ticket ticket)
-{
-    if (ticket <= finished_)
-    {
-        return;
-    }
-    const Ticket ahead = ticket - finished_ - 1;
-    if (ahead >= 64)
-    {
-        // Too far ahead to remember: the tickets before it are given up.
-        skipTo(ticket);
-        return;
-    }
-    finishedAhead_ |= std::uint64_t{1} << ahead;
-    collapse();
-}
-
-void AlertHandOver::skipTo(Ticket ticket)
-{
-    if (ticket <= finished_)
-    {
-        return;
-    }
-    const Ticket shift = ticket - finished_;
-    finishedAhead_ = shift >= 64 ? 0 : finishedAhead_ >> shift;
-    finished_ = ticket;
-    collapse();
-}
-
-void AlertHandOver::collapse()
-{
-    while ((finishedAhead_ & 1u) != 0)
-    {
-        ++finished_;
-        finishedAhead_ >>= 1;
-    }
 }
 
 AlertRecord AlertHandOver::current() const
@@ -123,7 +61,7 @@ AlertRecord AlertHandOver::current() const
 bool AlertHandOver::isFull() const
 {
     const std::lock_guard lock(mutex_);
-    return full_;
+    return held_;
 }
 
 } // namespace QX::SELComposite

@@ -23,62 +23,53 @@ struct AlertRecord
  * @brief The one shared record through which an alert handler hands its
  *        alert to the delivery thread it starts.
  *
- * There is no queue: the slot holds one record. A handler waits (bounded)
- * for the slot to be free, fills it and, once its thread has started,
- * waits (bounded) until the thread has copied the record out, so alerts
- * raised one after another are each handed over once, with their own data.
- * When a wait runs out the record is simply overwritten, and two threads
- * may then copy the same, later, alert.
+ * There is no queue: the record holds one alert. A handler holds the
+ * record from put() to release(): it fills it, starts its thread and waits
+ * (bounded) until that thread reports its alert delivered. The source calls
+ * the handlers one after another on its one dispatcher thread, so
+ * indications leave in the order the alerts came in, each with its own
+ * data, and a delivery thread never waits for another one.
  *
- * Every record gets a ticket, in the order the records were put in; a
- * delivery thread waits (bounded) for the threads of earlier tickets to
- * finish before it delivers, so indications leave in the order the alerts
- * came in. No lock is held while the caller does anything else.
+ * Every wait is bounded. When a handler's wait runs out it lets the record
+ * go, and the next alert overwrites it: a thread that had not copied the
+ * record by then copies the later alert, which is then delivered twice.
  */
 class AlertHandOver
 {
   public:
+    /** Numbers the alerts in the order they were put in, from 1. */
     using Ticket = std::uint64_t;
 
-    /** How long a handler waits for the slot, and for its thread. */
+    /** How long a handler waits for the record to be free. */
     static constexpr std::chrono::milliseconds handOverWait{1000};
-    /** How long a delivery thread waits for the threads before it. */
-    static constexpr std::chrono::milliseconds turnWait{2000};
+    /** How long a handler waits for its thread to deliver. */
+    static constexpr std::chrono::milliseconds deliveryWait{2000};
 
-    /** Handler side: waits for a free slot, then fills it. */
+    /** Handler side: waits for the record to be free, then fills it. */
     Ticket put(const DateTime& time, const std::string& nodePath);
-    /** Handler side: whether the thread took the record within the wait. */
-    bool awaitTaken(Ticket ticket);
-    /** Handler side: no thread will take the record; free the slot. */
-    void withdraw(Ticket ticket);
+    /** Handler side: waits until the alert of @p ticket was delivered;
+     *  false when the wait ran out first. */
+    bool awaitDelivered(Ticket ticket);
+    /** Handler side: lets the record go, unless a later alert holds it. */
+    void release(Ticket ticket);
 
-    /** Thread side: copies the record out and frees the slot. */
-    std::pair<AlertRecord, Ticket> take();
-    /** Thread side: waits until every earlier ticket has finished. */
-    void awaitTurn(Ticket ticket);
-    /** Thread side: this ticket is done, delivered or not. */
-    void finish(Ticket ticket);
+    /** Thread side: a copy of the record, and its ticket. */
+    std::pair<AlertRecord, Ticket> take() const;
+    /** Thread side: the alert of @p ticket is delivered, or dropped. */
+    void delivered(Ticket ticket);
 
-    /** The record as it stands, full or not. */
+    /** The record as it stands, held or not. */
     AlertRecord current() const;
+    /** Whether a handler holds the record. */
     bool isFull() const;
 
   private:
-    void finishLocked(Ticket ticket);
-    /** Counts every ticket up to @p ticket as finished. */
-    void skipTo(Ticket ticket);
-    /** Moves finished_ over the tickets finished ahead of it. */
-    void collapse();
-
     mutable std::mutex mutex_;
     std::condition_variable changed_;
     AlertRecord record_;
-    bool full_ = false;
-    Ticket written_ = 0;  // ticket of the record in the slot
-    Ticket taken_ = 0;    // highest ticket copied out
-    Ticket finished_ = 0; // every ticket up to this one is done
-    // Tickets finished out of order, waiting for the ones before them.
-    std::uint64_t finishedAhead_ = 0; // bit i: ticket finished_ + 1 + i
+    bool held_ = false;
+    Ticket written_ = 0;   // ticket of the record's alert
+    Ticket delivered_ = 0; // highest ticket reported delivered
 };
 
 } // namespace QX::SELComposite

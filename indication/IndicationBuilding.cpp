@@ -9,7 +9,6 @@
 #include "Support.h"
 #include "Utf8.h"
 
-#include <algorithm>
 #include <cwchar>
 #include <exception>
 #include <iostream>
@@ -21,66 +20,6 @@ namespace QX::SELComposite::indication
 namespace
 {
 
-/** What a resource text asks of printf when used as a format. */
-struct FormatUse
-{
-    unsigned integers = 0; // %d and %i conversions
-    bool other = false;    // any conversion that would need another type
-};
-
-bool isDigit(wchar_t c)
-{
-    return c >= L'0' && c <= L'9';
-}
-
-FormatUse formatUseOf(const std::wstring& text)
-{
-    FormatUse use;
-    const std::size_t size = text.size();
-    for (std::size_t i = 0; i < size; ++i)
-    {
-        if (text[i] != L'%')
-        {
-            continue;
-        }
-        if (++i == size)
-        {
-            use.other = true;
-            break;
-        }
-        if (text[i] == L'%')
-        {
-            continue;
-        }
-        while (i < size && std::wcschr(L"-+ #0", text[i]) != nullptr &&
-               text[i] != L'\0')
-        {
-            ++i;
-        }
-        while (i < size && isDigit(text[i]))
-        {
-            ++i;
-        }
-        if (i < size && text[i] == L'.')
-        {
-            ++i;
-            while (i < size && isDigit(text[i]))
-            {
-                ++i;
-            }
-        }
-        if (i < size && (text[i] == L'd' || text[i] == L'i'))
-        {
-            ++use.integers;
-        }
-        else
-        {
-            use.other = true;
-        }
-    }
-    return use;
-}
-
 /** The resource text of @p identifier in the current language. */
 std::wstring resourceText(const wchar_t* identifier)
 {
@@ -90,15 +29,7 @@ std::wstring resourceText(const wchar_t* identifier)
     return ResourceString(library, identifier).str();
 }
 
-/** @p text copied as it stands, cut to the buffer: used when the text
- *  holds conversions the call has no arguments for. */
-void copyInto(std::vector<wchar_t>& buffer, const std::wstring& text)
-{
-    const std::size_t length = std::min(text.size(), buffer.size() - 1);
-    std::wmemcpy(buffer.data(), text.data(), length);
-    buffer[length] = L'\0';
-}
-
+/** swprintf leaves the buffer unterminated when the text does not fit. */
 void terminate(std::vector<wchar_t>& buffer)
 {
     buffer.back() = L'\0';
@@ -258,19 +189,12 @@ bool walkInstrumentation(const char* function,
 
 std::string localizedMessage(const wchar_t* identifier)
 {
+    // The texts are the platform's own; a unit test checks that these hold
+    // no conversion, and that the full event's holds the one %d.
     std::vector<wchar_t> buffer(messageBufferSize, L'\0');
     const std::wstring text = resourceText(identifier);
-    const FormatUse use = formatUseOf(text);
-    if (use.integers == 0 && !use.other)
-    {
-        std::swprintf(buffer.data(), buffer.size(), text.c_str());
-        terminate(buffer);
-    }
-    else
-    {
-        // A conversion without its argument would read garbage.
-        copyInto(buffer, text);
-    }
+    std::swprintf(buffer.data(), buffer.size(), text.c_str());
+    terminate(buffer);
     return make_string(buffer.data());
 }
 
@@ -278,19 +202,10 @@ std::string localizedMessage(const wchar_t* identifier, int argument)
 {
     std::vector<wchar_t> buffer(fullMessageBufferSize, L'\0');
     const std::wstring text = resourceText(identifier);
-    if (text.empty())
-    {
-        return make_string(buffer.data());
-    }
-    const FormatUse use = formatUseOf(text);
-    if (use.integers <= 1 && !use.other)
+    if (!text.empty())
     {
         std::swprintf(buffer.data(), buffer.size(), text.c_str(), argument);
         terminate(buffer);
-    }
-    else
-    {
-        copyInto(buffer, text);
     }
     return make_string(buffer.data());
 }

@@ -62,7 +62,9 @@ void addTextKey(CMPIObjectPath* path, const char* name, const char* value);
 void setNoCorrelatedIndications(const CMPIBroker* broker,
                                 CMPIInstance* instance);
 
-/** Rows 13 to 17 of every indication: the system and the provider. */
+/** The last five properties of every indication, the system and the
+ *  provider: "SystemCreationClassName", "SystemName", "OwningEntity",
+ *  "ProviderName" and "UniqueSystemID". */
 void setCommonTail(CMPIInstance* instance);
 
 /** "IndicationTime" and "EventTime", both the alert time. */
@@ -107,12 +109,13 @@ constexpr std::size_t messageBufferSize = 512;
 constexpr std::size_t fullMessageBufferSize = 256;
 
 /** The text of @p identifier in the current language, formatted without
- *  arguments into a buffer of 512 wide characters, as UTF-8. */
+ *  arguments into a buffer of 512 wide characters, as UTF-8. The text
+ *  must hold no conversion. */
 std::string localizedMessage(const wchar_t* identifier);
 
 /** The text of @p identifier used as a format with the one integer
  *  @p argument, in a buffer of 256 wide characters; empty when the text
- *  is. */
+ *  is. The text must hold at most that one integer conversion. */
 std::string localizedMessage(const wchar_t* identifier, int argument);
 
 } // namespace QX::SELComposite::indication

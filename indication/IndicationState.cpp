@@ -5,8 +5,6 @@
 namespace QX::SELComposite
 {
 
-std::string loggerSELIndication = "Corvane.SELProvider";
-
 std::atomic<std::uint32_t> subscriberCountServerIndication{0};
 std::atomic<std::uint32_t> subscriberCountLogEntryIndication{0};
 std::atomic<std::uint32_t> subscriberCountLogFullIndication{0};
@@ -35,12 +33,20 @@ namespace
 constexpr std::chrono::seconds unloadWait{5};
 
 /**
- * Runs when the library is unloaded (or the process ends). The platform may
- * stay loaded after us and its sources must not call back into code that is
- * about to be unmapped: the watches still held are removed (after which no
- * alert handler of ours runs) and the delivery threads still in flight are
- * waited for. Defined after every other object of this unit, so that it is
- * destroyed before them.
+ * The one place where this library ends its own activity, when it is
+ * unloaded or the process ends: the watches still held are removed, after
+ * which the platform calls no alert handler of ours, and the alert handlers
+ * and delivery threads still running are waited for (indicationActivity
+ * counts both). Once it has run, no thread executes this library's code.
+ *
+ * It protects the code and the statics of this library from those
+ * threads. Every other static they touch is either destroyed after this
+ * guard (the objects of this unit, defined before it) or has no destructor
+ * at all (the logger component names, the atomics of the indication
+ * state), so the order in which units are linked does not matter. The
+ * platform library, which may stay loaded, ends its own threads itself:
+ * its teardown in platform/Platform.cpp destroys the source, which joins
+ * them.
  */
 struct UnloadGuard
 {

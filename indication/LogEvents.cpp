@@ -142,7 +142,7 @@ CMPIInstance* createLogClearIndicationInstance(std::string logPath,
             setAlertTimes(instance, alertTime);
             setNoCorrelatedIndications(broker, instance);
             setTypedProperty(instance, "PerceivedSeverity", std::uint16_t{2});
-            traceMessage(function, __LINE__, LOG_LEVEL_PROVIDER, "Before NLS");
+            // Only the entry and the full events note "Before NLS".
             setMessage(instance, localizedMessage(L"MSGID_SEL_LOG_CLEARED"));
             setAlertTail(instance, 5);
             return true;

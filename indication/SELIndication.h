@@ -10,12 +10,14 @@
 #include <chrono>
 #include <cstdint>
 #include <string>
+#include <string_view>
 
 namespace QX::SELComposite
 {
 
-/** Logger component of the indication code. */
-extern std::string loggerSELIndication;
+/** Logger component of the indication code. A constant, not a string object:
+ * threads still tracing while the library's statics are destroyed read it. */
+inline constexpr std::string_view loggerSELIndication = "Corvane.SELProvider";
 
 /** The namespace indications are delivered into. */
 constexpr const char* INDICATION_NAMESPACE = "root/zanqx";
@@ -32,9 +34,10 @@ constexpr unsigned short LOG_ENTRY_INDICATION_ID = 4;
 constexpr unsigned short LOG_FULL_INDICATION_ID = 5;
 constexpr unsigned short UNKNOWN_INDICATION_ID = 15;
 
-// The shared indication state. Every value is an atomic: the object
-// manager's threads, the instrumentation's monitoring threads and the
-// delivery threads all read and write it without a lock.
+// The shared indication state. Every value but the hand-over record is an
+// atomic: the object manager's threads, the instrumentation's monitoring
+// threads and the delivery threads all read and write it without a lock.
+// The record keeps its own lock (AlertHandOver).
 
 extern std::atomic<std::uint32_t> subscriberCountServerIndication;
 extern std::atomic<std::uint32_t> subscriberCountLogEntryIndication;

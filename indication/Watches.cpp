@@ -11,61 +11,57 @@
 namespace QX::SELComposite
 {
 
-namespace
-{
-
-/** Runs @p change on the platform's current source; an exception is
- *  written to standard error and logged as a failure of @p function. */
-template <typename Change>
-void onCurrentSource(const char* function, Change change)
-{
-    try
-    {
-        change(Platform::currentSource());
-    }
-    catch (const std::exception& error)
-    {
-        std::cerr << error.what() << std::endl;
-        indication::traceMessage(function, __LINE__, LOG_LEVEL_FAILURE,
-                                 error.what());
-    }
-}
-
-} // namespace
-
 void Watches::start(NodeLexicon::NodeType kind, MonitorCallback handler)
 {
-    onCurrentSource(
-        "Watches::start",
-        [&](const auto& source)
-        {
-            Instrumentation(source).startMonitoring(kind, handler, nullptr);
-            const std::lock_guard lock(mutex_);
-            registrations_.push_back(Registration{source, kind, handler});
-        });
+    change(true, kind, handler);
 }
 
 void Watches::stop(NodeLexicon::NodeType kind, MonitorCallback handler)
 {
-    onCurrentSource(
-        "Watches::stop",
-        [&](const auto& source)
+    change(false, kind, handler);
+}
+
+void Watches::change(bool watch, NodeLexicon::NodeType kind,
+                     MonitorCallback handler)
+{
+    try
+    {
+        const std::shared_ptr<InstrumentationSource> source =
+            Platform::currentSource();
+        Instrumentation cursor(source);
+        if (watch)
         {
-            Instrumentation(source).stopMonitoring(kind, handler, nullptr);
-            const std::lock_guard lock(mutex_);
-            const auto found =
-                std::find_if(registrations_.begin(), registrations_.end(),
-                             [&](const Registration& registration)
-                             {
-                                 return registration.kind == kind &&
-                                        registration.handler == handler &&
-                                        registration.source.lock() == source;
-                             });
-            if (found != registrations_.end())
-            {
-                registrations_.erase(found);
-            }
-        });
+            cursor.startMonitoring(kind, handler, nullptr);
+        }
+        else
+        {
+            cursor.stopMonitoring(kind, handler, nullptr);
+        }
+        const std::lock_guard lock(mutex_);
+        if (watch)
+        {
+            registrations_.push_back(Registration{source, kind, handler});
+            return;
+        }
+        const auto found =
+            std::find_if(registrations_.begin(), registrations_.end(),
+                         [&](const Registration& registration)
+                         {
+                             return registration.kind == kind &&
+                                    registration.handler == handler &&
+                                    registration.source.lock() == source;
+                         });
+        if (found != registrations_.end())
+        {
+            registrations_.erase(found);
+        }
+    }
+    catch (const std::exception& error)
+    {
+        std::cerr << error.what() << std::endl;
+        indication::traceMessage(watch ? "Watches::start" : "Watches::stop",
+                                 __LINE__, LOG_LEVEL_FAILURE, error.what());
+    }
 }
 
 void Watches::releaseAll() noexcept

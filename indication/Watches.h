@@ -32,6 +32,12 @@ class Watches
     std::size_t held() const;
 
   private:
+    /** Starts (@p watch) or stops the monitoring on the platform's current
+     *  source and keeps the list of registrations up to date; a failure is
+     *  written to standard error and logged. */
+    void change(bool watch, NodeLexicon::NodeType kind,
+                MonitorCallback handler);
+
     struct Registration
     {
         std::weak_ptr<InstrumentationSource> source;

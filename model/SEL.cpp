@@ -14,8 +14,6 @@
 namespace QX::SELComposite
 {
 
-std::string loggerSEL = "Corvane.SELProvider";
-
 namespace
 {
 

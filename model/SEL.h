@@ -6,12 +6,14 @@
 #include <cstdint>
 #include <map>
 #include <string>
+#include <string_view>
 
 namespace QX::SELComposite
 {
 
-/** Logger component of the log model. */
-extern std::string loggerSEL;
+/** Logger component of the log model. A constant, not a string object: threads
+ *  still tracing while the library's statics are destroyed read it. */
+inline constexpr std::string_view loggerSEL = "Corvane.SELProvider";
 
 /** Value written to the controller's Command property to clear the log. */
 constexpr unsigned CLEAR_LOG_COMMAND = 9;

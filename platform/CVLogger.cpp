@@ -30,7 +30,7 @@ LoggerState& state()
 }
 
 bool lists(const std::vector<std::string>& components,
-           const std::string& component)
+           std::string_view component)
 {
     return std::any_of(components.begin(), components.end(),
                        [&](const std::string& listed)
@@ -44,7 +44,7 @@ bool passes(int threshold, int level)
 
 /** Whether the line would be written; call with the mutex held. */
 bool acceptsLocked(const LoggerState& logger, Channel channel,
-                   const std::string& component, int level)
+                   std::string_view component, int level)
 {
     const int threshold = channel == Channel::Log ? logger.settings.logLevel
                                                   : logger.settings.traceLevel;
@@ -131,7 +131,7 @@ LoggerSettings CVLogger::settings()
     return logger.settings;
 }
 
-bool CVLogger::writes(Channel channel, const std::string& component, int level)
+bool CVLogger::writes(Channel channel, std::string_view component, int level)
 {
     LoggerState& logger = state();
     const int threshold =

@@ -3,6 +3,7 @@
 #include <memory>
 #include <mutex>
 #include <string>
+#include <string_view>
 #include <vector>
 
 namespace CVLog
@@ -93,8 +94,7 @@ class CVLogger
      * would reach a sink. Lets callers skip formatting lines that nobody
      * receives; the write calls decide again for themselves.
      */
-    static bool writes(Channel channel, const std::string& component,
-                       int level);
+    static bool writes(Channel channel, std::string_view component, int level);
 };
 
 /** A growable text buffer; str() hands out the text and empties it. */

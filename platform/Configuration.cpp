@@ -1,16 +1,7 @@
 /*
- * The platform configuration file: one "key = value" setting per line;
- * blank lines and lines starting with '#' are ignored, blanks around keys
- * and values are dropped, a later setting of a key replaces an earlier one.
- *
- *   source         = ipmi | memory  (default ipmi: the server's own BMC)
- *   memory.fixture = PATH           (empty: the built-in sample SEL)
- *   ipmi.*         = ...            (the BMC; see README.md)
- *   log.sink       = syslog | stderr | none | file:PATH
- *   log.level      = N              (N >= 0; 0 disables the log channel)
- *   trace.level    = N              (N >= 0; 0 disables the trace channel)
- *   log.components = * | name[,name...]
- *   locale         = en | de         (empty: the process environment)
+ * The platform configuration file. Its syntax and every key, with values
+ * and defaults, are described in docs/configuration.md; the ipmi.* keys are
+ * read by platform/ipmi/IpmiSettings.cpp.
  */
 #include "Configuration.h"
 

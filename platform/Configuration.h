@@ -12,7 +12,7 @@ constexpr const char* defaultConfigurationPath = "/etc/qx/platform.conf";
 /** Environment variable that, when set, names another configuration file. */
 constexpr const char* configurationPathVariable = "QX_PLATFORM_CONFIG";
 
-/** The settings of the platform configuration file (see README.md). */
+/** The settings of the platform configuration file (docs/configuration.md). */
 struct Configuration
 {
     /** "ipmi" (the default): the server's BMC, with the ipmi settings, in

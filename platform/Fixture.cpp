@@ -1,45 +1,8 @@
 /*
- * Fixture files: an instrumentation tree as text.
- *
- * The format is line oriented. Blank lines and lines whose first non-blank
- * character is '#' are ignored; a line may end in CR LF. Every other line is
- * one directive word followed by blank-separated key=value tokens, in any
- * order:
- *
- *   controller path=P [status=N] [description=T]
- *   log        path=P [parent=P] [status=N] [description=T] [Name=T]
- *              [MaxRecords=N] [OverwritePolicy=N] [DataFormat=T]
- *              [IsEmpty=B]
- *   entry      [RecordId=N] [Timestamp=T] [RecordData=T] [description=T]
- *              [path=P] [status=N] [parent=P]
- *   watchdog   path=P [parent=P] [status=N] [description=T]
- *              [RestartCause=N]
- *
- * Values: a value is either a run of non-blank characters, or a text in
- * double quotes that may hold blanks; inside quotes \" stands for a quote
- * and \\ for a backslash, and no other backslash escape is allowed. A closing
- * quote must be followed by a blank or the end of the line. N is an unsigned
- * number in strict decimal (digits only, at most 4294967295); B is exactly
- * "true" or "false"; T and P are any text. No key may appear twice on a line.
- *
- * Nodes are created in file order, which is the order cursors visit them.
- * A controller is a root node (kind ManagementController). A log (EventLog)
- * hangs under parent=, else under the last controller above it. An entry
- * (EventLogEntry) hangs under parent=, else under the last log above it; its
- * path defaults to the log path + "/entry-" + the five-digit record id
- * (MemorySource::entryPath), so an entry needs path= or RecordId=. A watchdog
- * (Watchdog) hangs under parent=, else under the last controller. status
- * defaults to 0 and description to the empty text.
- *
- * The keys Name, MaxRecords, OverwritePolicy, DataFormat, IsEmpty, RecordId,
- * RecordData, Timestamp and RestartCause set the node property of that name,
- * with the type the property has (text, unsigned or boolean). A property
- * that is not given is absent from the node (reading it fails); nothing is
- * derived, so a log's IsEmpty is exactly what the file says.
- *
- * Errors: an unknown directive or key, a duplicate key or node path, a
- * missing path, an unknown or missing parent, a malformed quote or number
- * throw FixtureError("<source>:<line>: <what>").
+ * Fixture files: an instrumentation tree as text, one directive a line
+ * (controller, log, entry, watchdog) with key=value tokens. The format, its
+ * defaults and its errors are described in docs/fixture-format.md; every
+ * error throws FixtureError("<source>:<line>: <what>").
  */
 #include "Fixture.h"
 

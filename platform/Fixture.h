@@ -20,7 +20,7 @@ class FixtureError : public std::runtime_error
 /**
  * @brief Reads an instrumentation tree from the fixture text format.
  *
- * The format is documented in README.md ("Fixture files"). Throws
+ * The format is documented in docs/fixture-format.md. Throws
  * FixtureError with the source name and line number on any error.
  */
 std::shared_ptr<const NodeTree> parseFixture(std::istream& in,

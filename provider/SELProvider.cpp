@@ -6,7 +6,6 @@ namespace QX::SELComposite
 {
 
 std::atomic<const CMPIBroker*> broker{nullptr};
-std::string loggerSELProvider = "Corvane.SELProvider";
 
 namespace
 {

@@ -5,6 +5,7 @@
 
 #include <atomic>
 #include <string>
+#include <string_view>
 
 namespace QX::SELComposite
 {
@@ -13,8 +14,10 @@ namespace QX::SELComposite
  *  wins. */
 extern std::atomic<const CMPIBroker*> broker;
 
-/** Logger component of the provider operations. */
-extern std::string loggerSELProvider;
+/** Logger component of the provider operations. A constant, not a string
+ * object: threads still tracing while the library's statics are destroyed read
+ * it. */
+inline constexpr std::string_view loggerSELProvider = "Corvane.SELProvider";
 
 CMPIStatus SEL_Cleanup(CMPIInstanceMI* mi, const CMPIContext* context,
                        CMPIBoolean terminating);

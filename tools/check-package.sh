@@ -26,6 +26,7 @@ expected="./etc/qx/platform.conf
 ./usr/lib/cmpi/libqxplatform.so
 ./usr/sbin/selprovider-register
 ./usr/share/doc/selprovider/changelog.gz
+./usr/share/doc/selprovider/configuration.md
 ./usr/share/doc/selprovider/copyright
 ./usr/share/doc/selprovider/deploying.md
 ./usr/share/man/man1/selprov.1.gz

@@ -19,7 +19,7 @@ enum class Interface
 /**
  * @brief The "ipmi.*" settings of the platform configuration file.
  *
- * The README's platform configuration table documents every key. The
+ * docs/configuration.md documents every key. The
  * password is held here only to open sessions; no text made from these
  * settings (log lines, errors) ever includes it.
  */

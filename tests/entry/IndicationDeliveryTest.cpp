@@ -37,6 +37,17 @@ class IndicationDelivery : public IndicationTest
     {
         return broker().faults().calls(call);
     }
+
+    /** Calls ClearLog on the log, as a client does. */
+    host::Outcome clearLog()
+    {
+        host::ObjectPath log = classPath("ZAN_MgmtHwLog");
+        log.keys.edit().emplace_back("CreationClassName",
+                                     host::Value::string("ZAN_MgmtHwLog"));
+        log.keys.edit().emplace_back("Name",
+                                     host::Value::string("IPMI SEL Log"));
+        return host().invokeMethod(log, "ClearLog");
+    }
 };
 
 TEST_F(IndicationDelivery, AFailedHardwareReadIsAFailureInTheLog)
@@ -152,11 +163,7 @@ TEST_F(IndicationDelivery, ClearLogBringsTheClearEvent)
 {
     subscribe(clearEvent);
     enable();
-    host::ObjectPath log = classPath("ZAN_MgmtHwLog");
-    log.keys.edit().emplace_back("CreationClassName",
-                                 host::Value::string("ZAN_MgmtHwLog"));
-    log.keys.edit().emplace_back("Name", host::Value::string("IPMI SEL Log"));
-    const host::Outcome cleared = host().invokeMethod(log, "ClearLog");
+    const host::Outcome cleared = clearLog();
     ASSERT_EQ(cleared.rc, CMPI_RC_OK);
     const auto delivered = next();
     ASSERT_TRUE(delivered.has_value());
@@ -364,6 +371,31 @@ TEST_F(IndicationDelivery, ProgressNotesAndDeliveryLinesHaveTheirLevels)
     EXPECT_EQ(condition.size(), 2u);
     EXPECT_EQ(linesWith("VARIABLE: 'newStatus' has Value '24'").size(), 2u);
     EXPECT_EQ(linesWith("VARIABLE: 'indicationClass' has Value '0'").size(),
+              2u);
+}
+
+TEST_F(IndicationDelivery, OnlyTheEntryAndFullEventsNoteBeforeNls)
+{
+    subscribe(clearEvent);
+    subscribe(restartEvent);
+    enable();
+    ASSERT_EQ(clearLog().rc, CMPI_RC_OK);
+    const auto cleared = next();
+    ASSERT_TRUE(cleared.has_value());
+    EXPECT_EQ(cleared->instance.path.className, clearEvent);
+    source->raiseAlert("/bmc0/wdt", alertTime);
+    const auto restarted = next();
+    ASSERT_TRUE(restarted.has_value());
+    EXPECT_EQ(restarted->instance.path.className, restartEvent);
+    settle();
+    // Both messages were looked up, without the note.
+    EXPECT_FALSE(cleared->instance.property("Message")->text().empty());
+    EXPECT_FALSE(restarted->instance.property("Message")->text().empty());
+    EXPECT_TRUE(linesWith("Before NLS").empty());
+    EXPECT_EQ(linesWith("LogHandler : CB Deliver Indication done").size(), 2u);
+    EXPECT_EQ(linesWith("AutoServerRestartHandler : CB Deliver Indication "
+                        "done")
+                  .size(),
               2u);
 }
 

@@ -5,6 +5,7 @@
 #include "Platform.h"
 
 #include <fstream>
+#include <set>
 #include <sstream>
 #include <string>
 #include <vector>
@@ -14,14 +15,42 @@
 namespace
 {
 
-std::string installedConfigurationText()
+std::string sourceFileText(const std::string& relativePath)
 {
-    const std::string path =
-        std::string(SELPROV_SOURCE_DIR) + "/platform/platform.conf";
-    std::ifstream in(path);
+    std::ifstream in(std::string(SELPROV_SOURCE_DIR) + "/" + relativePath);
     std::ostringstream text;
     text << in.rdbuf();
     return text.str();
+}
+
+std::string installedConfigurationText()
+{
+    return sourceFileText("platform/platform.conf");
+}
+
+std::string keyOf(const std::string& setting)
+{
+    return setting.substr(0, setting.find(' '));
+}
+
+// The keys of the configuration guide's table: rows "| `key` | ...".
+std::set<std::string> documentedKeys()
+{
+    std::set<std::string> keys;
+    std::istringstream lines(sourceFileText("docs/configuration.md"));
+    std::string line;
+    while (std::getline(lines, line))
+    {
+        if (line.starts_with("| `"))
+        {
+            const std::size_t end = line.find('`', 3);
+            if (end != std::string::npos)
+            {
+                keys.insert(line.substr(3, end - 3));
+            }
+        }
+    }
+    return keys;
 }
 
 // The "# key = value" lines: after "# ", a key (lower-case letters, dots
@@ -90,6 +119,36 @@ TEST(InstalledConfiguration, EveryCommentedOutKeyIsAValidSetting)
         EXPECT_NO_THROW(QX::Platform::parseConfiguration(setting, "line"))
             << setting;
     }
+}
+
+} // namespace
+
+namespace
+{
+
+// The file the package installs and the configuration guide name the same
+// keys: each key shown in the file has a row in the guide, and each row's
+// key is shown in the file (set, or commented out at its default).
+TEST(InstalledConfiguration, ShowsExactlyTheKeysTheGuideDocuments)
+{
+    const std::string text = installedConfigurationText();
+    std::set<std::string> shown;
+    for (const std::string& setting : commentedSettings(text))
+    {
+        shown.insert(keyOf(setting));
+    }
+    std::istringstream lines(text);
+    std::string line;
+    while (std::getline(lines, line))
+    {
+        if (!line.empty() && !line.starts_with('#'))
+        {
+            shown.insert(keyOf(line));
+        }
+    }
+    const std::set<std::string> documented = documentedKeys();
+    EXPECT_GE(documented.size(), 20u);
+    EXPECT_EQ(shown, documented);
 }
 
 } // namespace

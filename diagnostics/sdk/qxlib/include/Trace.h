@@ -6,6 +6,7 @@
 #include <cstdio>
 #include <cstring>
 #include <string>
+#include <string_view>
 
 namespace QX
 {
@@ -144,7 +145,7 @@ inline const char* trace(const char* name, const char* file, unsigned line,
  */
 template <typename Format>
 void logAndTrace(const char* function, const char* file, int line,
-                 const std::string& component, int level, const Format& format)
+                 std::string_view component, int level, const Format& format)
 {
     using CVLog::Channel;
     using CVLog::CVLogger;
@@ -152,23 +153,22 @@ void logAndTrace(const char* function, const char* file, int line,
     if (CVLogger::writes(Channel::Log, component, level))
     {
         buffer << format();
-        CVLogger::logLevelMessage(function, file, line, component, level,
-                                  nullptr, 0, 0,
+        CVLogger::logLevelMessage(function, file, line, std::string(component),
+                                  level, nullptr, 0, 0,
                                   CVLog::CVMessageBuffer::str(buffer));
     }
     if (CVLogger::writes(Channel::Trace, component, level))
     {
         buffer << format();
-        CVLogger::traceLevelMessage(function, file, line, component, level,
-                                    nullptr, 0, 0,
-                                    CVLog::CVMessageBuffer::str(buffer));
+        CVLogger::traceLevelMessage(function, file, line,
+                                    std::string(component), level, nullptr, 0,
+                                    0, CVLog::CVMessageBuffer::str(buffer));
     }
 }
 
 /** Logs and traces a MESSAGE line with @p text. */
 inline void logMessage(const char* function, const char* file, int line,
-                       const std::string& component, int level,
-                       const char* text)
+                       std::string_view component, int level, const char* text)
 {
     logAndTrace(function, file, line, component, level,
                 [&] {
@@ -180,7 +180,7 @@ inline void logMessage(const char* function, const char* file, int line,
 /** Logs and traces a VARIABLE line at LOG_LEVEL_PROVIDER. */
 template <typename Value>
 void logVariable(const char* function, const char* file, int line,
-                 const std::string& component, const char* name, Value value)
+                 std::string_view component, const char* name, Value value)
 {
     logAndTrace(
         function, file, line, component, LOG_LEVEL_PROVIDER,
@@ -189,7 +189,7 @@ void logVariable(const char* function, const char* file, int line,
 
 /** Logs and traces an ENTERING (or EXITING) line for @p function. */
 inline void logFunctionEdge(const char* function, const char* file, int line,
-                            const std::string& component, MessageType type)
+                            std::string_view component, MessageType type)
 {
     logAndTrace(
         function, file, line, component, LOG_LEVEL_PROVIDER,
@@ -198,9 +198,8 @@ inline void logFunctionEdge(const char* function, const char* file, int line,
 }
 
 /** Frames a provider operation: banner, then its ENTERING line. */
-inline void markProviderEntry(const std::string& component,
-                              const char* function, const char* file,
-                              unsigned line)
+inline void markProviderEntry(std::string_view component, const char* function,
+                              const char* file, unsigned line)
 {
     logAndTrace("markProviderEntry", TRACE_HEADER_PATH, 336, component,
                 LOG_LEVEL_PROVIDER, [] { return TRACE_BANNER; });
@@ -210,7 +209,7 @@ inline void markProviderEntry(const std::string& component,
 }
 
 /** Closes the frame: the operation's EXITING line, then a banner. */
-inline void markProviderExit(const std::string& component, const char* function,
+inline void markProviderExit(std::string_view component, const char* function,
                              const char* file, unsigned line)
 {
     logAndTrace("markProviderExit", TRACE_HEADER_PATH, 348, component,
