@@ -22,6 +22,10 @@
 # beside a cold process without a kept copy and ipmi-sel in the same run;
 # each with the IPMI requests the process sent after its session opened
 # (the session's counter, as selprov --timing prints it).
+# With BENCH_SEL_DELAY_MS=N the restart table is made again on a simulator
+# that answers every SEL command N ms late (bmcsim --sel-delay-ms), as a
+# real BMC over a LAN does; session set-up and the other commands are not
+# delayed, for either tool.
 # Each figure is the median of RUNS runs (default 3). BENCH_PART=restart
 # runs the restart table alone, BENCH_PART=read the first one alone.
 set -euo pipefail
@@ -109,17 +113,19 @@ part=${BENCH_PART:-all}
 drop_copy() { rm -f "$bench"/platform-state/sel-copy-*; }
 cold_selprov() { drop_copy; "$bin/selprov" "$@"; }
 
-# Starts the simulator with N records and writes the IPMI configuration;
-# sets host and port.
-start_simulator() { # records
+# Starts the simulator with N records (and further bmcsim start options)
+# and writes the IPMI configuration; sets host and port.
+start_simulator() { # records [option...]
+    local count=$1
+    shift
     "$bin/bmcsim" stop --dir "$bench/sim" >/dev/null 2>&1 || true
     rm -rf "$bench/sim" "$bench/platform-state"
     mkdir -p "$bench/sim"
     # Room for the records and the ones added later, below 4096 free
     # records so that the 16-bit free-space field does not wrap.
     local simulator
-    simulator=$("$bin/bmcsim" start --dir "$bench/sim" --generate "$1" \
-        --max-records $(($1 + 100)))
+    simulator=$("$bin/bmcsim" start --dir "$bench/sim" --generate "$count" \
+        --max-records $((count + 100)) "$@")
     host=$(sed -n 's/^host=//p' <<<"$simulator")
     port=${host##*:}
     simulated_bmc_conf "$bench/ipmi.conf" "$host" "$bench" "log.sink = none"
@@ -156,14 +162,14 @@ for records in 1000 5000; do
     row "selprov enumerate the log, cold (no kept copy)" "$records" \
         "$(median_seconds cold_selprov --config "$bench/ipmi.conf" \
             enumerate ZAN_MgmtHwLog)" "$reference"
-    row "Enumerate entries, warm (2nd request of a batch)" "$records" \
-        "$(warm_request "$bench/ipmi.conf" ZAN_MgmtHwLogEntry)" "$reference"
-    row "  the same on the in-memory source" "$records" \
-        "$(warm_request "$bench/memory.conf" ZAN_MgmtHwLogEntry)" "$reference"
-    row "Enumerate the log, warm (2nd request of a batch)" "$records" \
-        "$(warm_request "$bench/ipmi.conf" ZAN_MgmtHwLog)" "$reference"
-    row "  the same on the in-memory source" "$records" \
-        "$(warm_request "$bench/memory.conf" ZAN_MgmtHwLog)" "$reference"
+    for class in ZAN_MgmtHwLogEntry ZAN_MgmtHwLog; do
+        what=entries
+        [[ $class == ZAN_MgmtHwLog ]] && what="the log"
+        row "Enumerate $what, warm (2nd request of a batch)" "$records" \
+            "$(warm_request "$bench/ipmi.conf" "$class")" "$reference"
+        row "  the same on the in-memory source" "$records" \
+            "$(warm_request "$bench/memory.conf" "$class")" "$reference"
+    done
     if ((records == 5000)); then
         row "Enumerate entries after 10 new records" "$records" \
             "$(ten_new_records "$bench/ipmi.conf" ZAN_MgmtHwLogEntry)" \
@@ -192,8 +198,8 @@ restart_median() { # config command...
     local config=$1
     shift
     for ((i = 0; i < runs; i++)); do
-        "$@"
-        restart_run "$config"
+        "$@" </dev/null
+        restart_run "$config" </dev/null
     done | sort -g | awk '{ l[NR] = $0 } END { print l[int((NR + 1) / 2)] }'
 }
 restart_row() { # what records "seconds requests" reference
@@ -206,29 +212,46 @@ nothing() { :; }
 add_ten() { "$bin/bmcsim" add --dir "$bench/sim" --count 10; }
 clear_sel() { "$bin/bmcsim" clear --dir "$bench/sim"; }
 
-records=3000
-start_simulator "$records"
-ipmisel=(ipmi-sel -D LAN_2_0 -h "$host" -u admin -p password -l ADMIN
-         -W opensesspriv --sdr-cache-directory="$bench/sdrcache" --quiet-cache)
-mkdir -p "$bench/sdrcache"
-"${ipmisel[@]}" --sdr-cache-recreate >/dev/null 2>&1
-# Builds the SDR cache and the first kept copy.
-"$bin/selprov" --config "$bench/ipmi.conf" enumerate-names ZAN_MgmtHwLog \
-    >/dev/null
-reference=$(median_seconds "${ipmisel[@]}")
+# The restart table on a simulator started with the bmcsim options given.
+restart_table() { # title option...
+    local title=$1
+    shift
+    start_simulator "$records" "$@"
+    ipmisel=(ipmi-sel -D LAN_2_0 -h "$host" -u admin -p password -l ADMIN
+             -W opensesspriv --sdr-cache-directory="$bench/sdrcache"
+             --quiet-cache)
+    mkdir -p "$bench/sdrcache"
+    "${ipmisel[@]}" --sdr-cache-recreate >/dev/null 2>&1
+    # Builds selprov's SDR cache.
+    "$bin/selprov" --config "$bench/ipmi.conf" enumerate-names ZAN_MgmtHwLog \
+        >/dev/null
+    local reference
+    reference=$(median_seconds "${ipmisel[@]}")
 
-echo
-echo "| new selprov process (enumerate entries) | records | requests | ms | vs ipmi-sel | faster |"
-echo "|---|---|---|---|---|---|"
-printf '| %-46s | %6s | %8s | %10.3f | %9.4fx | %8.1fx |\n' \
-    "ipmi-sel (FreeIPMI, LAN 2.0)" "$records" "-" \
-    "$(echo "$reference * 1000" | bc -l)" 1 1
-restart_row "cold: no kept copy" "$records" \
-    "$(restart_median "$bench/ipmi.conf" drop_copy)" "$reference"
-restart_run "$bench/ipmi.conf" >/dev/null # keeps the copy again
-restart_row "restart, unchanged SEL" "$records" \
-    "$(restart_median "$bench/ipmi.conf" nothing)" "$reference"
-restart_row "restart, 10 records added meanwhile" "$records+10" \
-    "$(restart_median "$bench/ipmi.conf" add_ten)" "$reference"
-restart_row "restart after a clear" "0" \
-    "$(restart_median "$bench/ipmi.conf" clear_sel)" "$reference"
+    echo
+    echo "$title"
+    echo
+    echo "| new selprov process (enumerate entries) | records | requests | ms | vs ipmi-sel | faster |"
+    echo "|---|---|---|---|---|---|"
+    restart_row "ipmi-sel (FreeIPMI, LAN 2.0)" "$records" "$reference -" \
+        "$reference"
+    # Each setup runs before every timed run; the cold runs keep the copy
+    # that the first restart row then finds.
+    local label count setup
+    while IFS='|' read -r label count setup; do
+        restart_row "$label" "$count" \
+            "$(restart_median "$bench/ipmi.conf" "$setup")" "$reference"
+    done <<EOF
+cold: no kept copy|$records|drop_copy
+restart, unchanged SEL|$records|nothing
+restart, 10 records added meanwhile|$records+10|add_ten
+restart after a clear|0|clear_sel
+EOF
+}
+
+records=3000
+restart_table "Loopback: the simulator answers at once."
+if [[ -n ${BENCH_SEL_DELAY_MS:-} ]]; then
+    restart_table "Every SEL command answered ${BENCH_SEL_DELAY_MS} ms late." \
+        --sel-delay-ms "$BENCH_SEL_DELAY_MS"
+fi

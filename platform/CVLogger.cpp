@@ -2,6 +2,7 @@
 
 #include <algorithm>
 #include <atomic>
+#include <mutex>
 #include <utility>
 
 namespace CVLog
@@ -72,24 +73,6 @@ void emit(Channel channel, const char* function, const char* file, int line,
 }
 
 } // namespace
-
-void CaptureSink::write(const LogRecord& record)
-{
-    const std::lock_guard lock(mutex_);
-    records_.push_back(record);
-}
-
-std::vector<LogRecord> CaptureSink::records() const
-{
-    const std::lock_guard lock(mutex_);
-    return records_;
-}
-
-void CaptureSink::clear()
-{
-    const std::lock_guard lock(mutex_);
-    records_.clear();
-}
 
 void CVLogger::logLevelMessage(const char* function, const char* file, int line,
                                const std::string& component, int level,

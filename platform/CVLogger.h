@@ -45,19 +45,6 @@ std::shared_ptr<LogSink> makeStderrSink();
  *  the file cannot be opened. */
 std::shared_ptr<LogSink> makeFileSink(const std::string& path);
 
-/** Keeps every record in memory, for tests. */
-class CaptureSink : public LogSink
-{
-  public:
-    void write(const LogRecord& record) override;
-    std::vector<LogRecord> records() const;
-    void clear();
-
-  private:
-    mutable std::mutex mutex_;
-    std::vector<LogRecord> records_;
-};
-
 /** Which lines are written. A channel writes a line when its threshold is
  *  non-zero, the line's level is at least the threshold and the component
  *  is listed ("*" lists all). */

@@ -15,7 +15,8 @@ namespace QX
  * @brief A cursor over the instrumentation tree.
  *
  * Made by its default constructor on the platform's configured source, used
- * for one walk and destroyed. The cursor reads one snapshot of the tree,
+ * for one walk and destroyed; the source decides how the walk goes (see
+ * InstrumentationSource::openWalk). The cursor reads one snapshot of the tree,
  * taken at its first selection, so a walk sees a consistent tree even while
  * the source changes. Every operation may throw a std::exception.
  *
@@ -63,22 +64,12 @@ class Instrumentation
                         const void* context);
 
   private:
-    const NodeTree& tree();
-    const NodeRecord* current() const;
-    const NodeRecord& currentOrThrow(const char* operation) const;
-    void positionOnFirst();
     template <typename T>
     bool readProperty(NodeLexicon::Properties property, T& value);
 
+    // The walk refers to the source: declared after it, destroyed before it.
     std::shared_ptr<InstrumentationSource> source_;
-    std::shared_ptr<const NodeTree> tree_;
-    bool hasKind_ = false;
-    NodeLexicon::NodeType kind_{};
-    NodeTree::NodeId filter_ = NodeTree::none;
-    bool filterUnknown_ = false; // filter path named no node: nothing matches
-    const std::vector<NodeTree::NodeId>* list_ = nullptr;
-    std::size_t index_ = 0;
-    NodeTree::NodeId node_ = NodeTree::none;
+    std::unique_ptr<SnapshotWalk> walk_;
 };
 
 } // namespace QX

@@ -3,10 +3,8 @@
 #include "DateTime.h"
 #include "NodeLexicon.h"
 #include "NodeTree.h"
-#include "SimulatedAlert.h"
 
 #include <memory>
-#include <stdexcept>
 #include <string>
 
 namespace QX
@@ -16,25 +14,7 @@ namespace QX
 using MonitorCallback = void (*)(unsigned int alertCode, DateTime when,
                                  std::string nodePath, const void* context);
 
-/** Cursor operations, named so a source can fail any one of them. */
-enum class CursorOperation
-{
-    Construct,
-    SelectKind,
-    SelectPath,
-    Valid,
-    Next,
-    SetFilter,
-    GetPath,
-    GetParentPath,
-    ConvertPath,
-    GetDescription,
-    GetStatus,
-    GetProperty,
-    SetProperty,
-    StartMonitoring,
-    StopMonitoring,
-};
+class SnapshotWalk;
 
 /**
  * @brief Where the instrumentation tree comes from: the BMC, or memory.
@@ -60,8 +40,18 @@ class InstrumentationSource
                                NodeLexicon::Properties property,
                                unsigned value) = 0;
 
-    /** Printable form of a path of this source. */
-    virtual std::string printablePath(const std::string& path) const = 0;
+    /** Printable form of a path of a source: the path behind "IPMI:". */
+    std::string printablePath(const std::string& path) const
+    {
+        return "IPMI:" + path;
+    }
+
+    /**
+     * A walk for one cursor over this source. The default walks one
+     * snapshot of the tree and sends writes and monitoring requests back
+     * to this source, which must outlive the walk.
+     */
+    virtual std::unique_ptr<SnapshotWalk> openWalk();
 
     /**
      * Registers @p callback for alerts of nodes of @p kind. Callbacks are
@@ -81,25 +71,6 @@ class InstrumentationSource
     virtual void stopMonitoring(NodeLexicon::NodeType kind,
                                 MonitorCallback callback,
                                 const void* context) = 0;
-
-    /**
-     * Makes the hardware behind the source raise @p alert, as it would by
-     * itself (see SimulatedAlert). Sources that cannot simulate throw
-     * std::runtime_error saying so; only the in-memory source can.
-     */
-    virtual void raiseSimulatedAlert(SimulatedAlert alert)
-    {
-        throw std::runtime_error(
-            std::string("this instrumentation source cannot simulate "
-                        "alerts (asked for \"") +
-            simulatedAlertName(alert) + "\"); only source = memory can");
-    }
-
-    /**
-     * Called by a cursor before each of its operations. A source throws a
-     * std::exception here to fail that operation; the default does nothing.
-     */
-    virtual void beforeOperation(CursorOperation /*operation*/) {}
 };
 
 } // namespace QX

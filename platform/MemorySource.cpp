@@ -96,11 +96,6 @@ MemorySource::clearLogsLocked(NodeTree::NodeId controller)
     return cleared;
 }
 
-std::string MemorySource::printablePath(const std::string& path) const
-{
-    return "IPMI:" + path;
-}
-
 void MemorySource::startMonitoring(NodeLexicon::NodeType kind,
                                    MonitorCallback callback,
                                    const void* context)
@@ -112,40 +107,6 @@ void MemorySource::stopMonitoring(NodeLexicon::NodeType kind,
                                   MonitorCallback callback, const void* context)
 {
     dispatcher_.remove(kind, callback, context);
-}
-
-void MemorySource::beforeOperation(CursorOperation operation)
-{
-    if (!faultsArmed_.load(std::memory_order_acquire))
-    {
-        return;
-    }
-    const std::lock_guard lock(mutex_);
-    std::optional<std::string> failure;
-    for (auto armed = faults_.begin(); armed != faults_.end();)
-    {
-        if (armed->fault.operation != operation)
-        {
-            ++armed;
-            continue;
-        }
-        ++armed->calls;
-        if (!failure && armed->calls > armed->fault.skip)
-        {
-            failure = armed->fault.message;
-            if (!armed->fault.repeat)
-            {
-                armed = faults_.erase(armed);
-                continue;
-            }
-        }
-        ++armed;
-    }
-    faultsArmed_.store(!faults_.empty(), std::memory_order_release);
-    if (failure)
-    {
-        throw std::runtime_error(*failure);
-    }
 }
 
 void MemorySource::replaceTree(std::shared_ptr<const NodeTree> tree)
@@ -203,20 +164,6 @@ void MemorySource::raiseAlert(const std::string& path, const DateTime& when)
                                     " raise no alerts");
     }
     deliver({{path, *code}}, kind, when);
-}
-
-void MemorySource::armFault(const CursorFault& fault)
-{
-    const std::lock_guard lock(mutex_);
-    faults_.push_back(ArmedFault{fault, 0});
-    faultsArmed_.store(true, std::memory_order_release);
-}
-
-void MemorySource::clearFaults()
-{
-    const std::lock_guard lock(mutex_);
-    faults_.clear();
-    faultsArmed_.store(false, std::memory_order_release);
 }
 
 void MemorySource::refuseWrites(bool refuse)
@@ -294,7 +241,21 @@ void MemorySource::raiseSimulatedAlert(SimulatedAlert alert)
             simulateRestart();
             return;
     }
-    InstrumentationSource::raiseSimulatedAlert(alert);
+    throw std::invalid_argument("unknown simulated alert " +
+                                std::to_string(static_cast<int>(alert)));
+}
+
+void raiseSimulatedAlert(InstrumentationSource& source, SimulatedAlert alert)
+{
+    auto* memory = dynamic_cast<MemorySource*>(&source);
+    if (memory == nullptr)
+    {
+        throw std::runtime_error(
+            std::string("this instrumentation source cannot simulate "
+                        "alerts (asked for \"") +
+            simulatedAlertName(alert) + "\"); only source = memory can");
+    }
+    memory->raiseSimulatedAlert(alert);
 }
 
 NodeTree::NodeId MemorySource::firstControllerLocked() const

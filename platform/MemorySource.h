@@ -2,6 +2,7 @@
 
 #include "AlertDispatcher.h"
 #include "InstrumentationSource.h"
+#include "SimulatedAlert.h"
 
 #include <atomic>
 #include <chrono>
@@ -12,6 +13,27 @@
 
 namespace QX
 {
+
+/** Cursor operations, named so that a fault can be armed on any one of
+ *  them (see MemorySource::armFault). */
+enum class CursorOperation
+{
+    Construct,
+    SelectKind,
+    SelectPath,
+    Valid,
+    Next,
+    SetFilter,
+    GetPath,
+    GetParentPath,
+    ConvertPath,
+    GetDescription,
+    GetStatus,
+    GetProperty,
+    SetProperty,
+    StartMonitoring,
+    StopMonitoring,
+};
 
 /** A failure armed on a MemorySource: the given cursor operation throws
  *  std::runtime_error(message) on its @p skip+1-th call from now on, then
@@ -47,12 +69,14 @@ class MemorySource : public InstrumentationSource
     bool writeProperty(const std::string& path,
                        NodeLexicon::Properties property,
                        unsigned value) override;
-    std::string printablePath(const std::string& path) const override;
+    /** A walk that fails where a fault is armed (see armFault) and
+     *  otherwise walks a snapshot as every source's does. */
+    std::unique_ptr<SnapshotWalk> openWalk() override;
     void startMonitoring(NodeLexicon::NodeType kind, MonitorCallback callback,
                          const void* context) override;
     void stopMonitoring(NodeLexicon::NodeType kind, MonitorCallback callback,
                         const void* context) override;
-    void beforeOperation(CursorOperation operation) override;
+
     /**
      * Changes the simulated BMC as its hardware would and raises the alert
      * that goes with it, on the first controller's first log (or watchdog):
@@ -64,7 +88,7 @@ class MemorySource : public InstrumentationSource
      * (RestartCause 4, a watchdog expiry) when the controller has none.
      * Throws std::runtime_error when the tree has no controller or log.
      */
-    void raiseSimulatedAlert(SimulatedAlert alert) override;
+    void raiseSimulatedAlert(SimulatedAlert alert);
 
     /** Replaces the whole tree. */
     void replaceTree(std::shared_ptr<const NodeTree> tree);
@@ -83,7 +107,8 @@ class MemorySource : public InstrumentationSource
      *  code of its kind, at @p when. */
     void raiseAlert(const std::string& path, const DateTime& when);
 
-    /** Arms a fault; several may be armed at once. */
+    /** Arms a fault on the cursors of this source, those open already
+     *  included; several may be armed at once. */
     void armFault(const CursorFault& fault);
     void clearFaults();
     /** While true, every property write is refused (returns false). */
@@ -103,6 +128,8 @@ class MemorySource : public InstrumentationSource
     static std::string entryPath(const std::string& logPath, unsigned recordId);
 
   private:
+    class FaultingWalk;
+
     struct ArmedFault
     {
         CursorFault fault;
@@ -121,6 +148,8 @@ class MemorySource : public InstrumentationSource
     /** Sets the first log's status and raises AlertOnEventLog for it. */
     void simulateLogStatus(unsigned status);
     void simulateRestart();
+    /** Throws the armed fault's message when @p operation is to fail now. */
+    void failIfArmed(CursorOperation operation);
 
     mutable std::mutex mutex_;
     std::shared_ptr<const NodeTree> tree_;
@@ -133,5 +162,12 @@ class MemorySource : public InstrumentationSource
     // callbacks may call back into the source.
     AlertDispatcher dispatcher_;
 };
+
+/**
+ * Has @p source raise @p alert as its hardware would (see
+ * MemorySource::raiseSimulatedAlert). Only the in-memory source can; any
+ * other throws std::runtime_error saying so.
+ */
+void raiseSimulatedAlert(InstrumentationSource& source, SimulatedAlert alert);
 
 } // namespace QX

@@ -110,14 +110,8 @@ NodeTreeBuilder& NodeTreeBuilder::addNode(NodeLexicon::NodeType kind,
     {
         throw std::length_error("too many nodes in one tree");
     }
-    NodeRecord record;
-    record.kind = kind;
-    record.path = path;
-    record.description = description;
-    record.status = status;
-    record.parent = parent;
     const auto id = static_cast<NodeTree::NodeId>(nodes_.size());
-    nodes_.push_back(std::move(record));
+    nodes_.push_back(NodeRecord{kind, path, description, status, parent, {}});
     byPath_.emplace(path, id);
     return *this;
 }

@@ -17,9 +17,4 @@ std::shared_ptr<InstrumentationSource> currentSource();
  *  pointer returns to the configuration at the next use. */
 void overrideSource(std::shared_ptr<InstrumentationSource> source);
 
-/** Has the current source raise a simulated alert; throws
- *  std::runtime_error when it cannot (see
- *  InstrumentationSource::raiseSimulatedAlert). */
-void raiseSimulatedAlert(SimulatedAlert alert);
-
 } // namespace QX::Platform

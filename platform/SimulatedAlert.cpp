@@ -1,7 +1,5 @@
 #include "SimulatedAlert.h"
 
-#include "Platform.h"
-
 #include <array>
 #include <utility>
 
@@ -55,15 +53,5 @@ std::string simulatedAlertNames()
     }
     return list;
 }
-
-namespace Platform
-{
-
-void raiseSimulatedAlert(SimulatedAlert alert)
-{
-    currentSource()->raiseSimulatedAlert(alert);
-}
-
-} // namespace Platform
 
 } // namespace QX

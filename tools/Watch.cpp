@@ -1,5 +1,6 @@
 #include "Watch.h"
 
+#include "MemorySource.h"
 #include "Platform.h"
 #include "Printing.h"
 #include "SimulatedAlert.h"
@@ -74,7 +75,10 @@ int raiseOne(const std::string& name)
 {
     try
     {
-        QX::Platform::raiseSimulatedAlert(*QX::simulatedAlertFromName(name));
+        // The platform's source is the provider's too: simulating there is
+        // what the provider sees as its hardware raising the alert.
+        QX::raiseSimulatedAlert(*QX::Platform::currentSource(),
+                                *QX::simulatedAlertFromName(name));
     }
     catch (const std::exception& error)
     {

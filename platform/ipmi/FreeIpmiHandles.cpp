@@ -28,7 +28,14 @@ constexpr const char* noInbandBmc =
     "reach the BMC over the network with ipmi.interface = lan and "
     "ipmi.host in the platform configuration (/etc/qx/platform.conf)";
 
+constexpr const char* inbandProbe = "ipmi_ctx_find_inband";
+
 } // namespace
+
+bool isNoInbandBmc(const IpmiError& error)
+{
+    return error.call() == inbandProbe && error.detail() == noInbandBmc;
+}
 
 ErrorCategory categoryOf(int ipmiErrnum)
 {
@@ -176,8 +183,7 @@ IpmiContext::IpmiContext(const SessionParameters& parameters) :
         }
         if (found == 0)
         {
-            throw IpmiError("ipmi_ctx_find_inband", ErrorCategory::Other,
-                            noInbandBmc);
+            throw IpmiError(inbandProbe, ErrorCategory::Other, noInbandBmc);
         }
         return;
     }

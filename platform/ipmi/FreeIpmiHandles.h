@@ -166,4 +166,8 @@ class SelContext
 /** The category of a FreeIPMI context error number. */
 ErrorCategory categoryOf(int ipmiErrnum);
 
+/** True for the error of an in-band probe that found no BMC on this
+ *  machine (no IPMI device, or the kernel driver not loaded). */
+bool isNoInbandBmc(const IpmiError& error);
+
 } // namespace QX::Ipmi

@@ -68,12 +68,19 @@ class IpmiError : public std::runtime_error
     std::optional<std::uint8_t> completionCode_;
 };
 
-/** Completion codes the SEL code acts on. */
-constexpr std::uint8_t completionEraseInProgress = 0x81;
-constexpr std::uint8_t completionInvalidCommand = 0xC1;
-constexpr std::uint8_t completionTimedOut = 0xC3;
-constexpr std::uint8_t completionReservationCancelled = 0xC5;
-constexpr std::uint8_t completionRecordNotPresent = 0xCB;
-constexpr std::uint8_t completionInsufficientPrivilege = 0xD4;
+/** Completion codes the SEL code acts on, and the simulated BMCs of the
+ *  tests answer with. */
+enum CompletionCode : std::uint8_t
+{
+    completionOk = 0x00,
+    completionEraseInProgress = 0x81,
+    completionInvalidCommand = 0xC1,
+    completionTimedOut = 0xC3,
+    completionReservationCancelled = 0xC5,
+    completionRequestLengthInvalid = 0xC7,
+    completionRecordNotPresent = 0xCB,
+    completionInvalidDataField = 0xCC,
+    completionInsufficientPrivilege = 0xD4,
+};
 
 } // namespace QX::Ipmi

@@ -106,6 +106,10 @@ class IpmiSession : public BmcCommands
     bool guarded_;
     std::shared_ptr<IpmiContext> context_;
     bool lost_ = false; // the last session ended in a failure
+    // The answer of the last in-band probe that found no BMC, and when it
+    // was given: repeated instead of probing again for a while.
+    std::optional<IpmiError> noBmc_;
+    std::chrono::steady_clock::time_point noBmcSince_;
     std::atomic<std::uint64_t> generation_{0};
     std::atomic<std::uint64_t> requests_{0};    // exchanges sent
     std::atomic<std::int64_t> lastActivity_{0}; // steady clock, ns

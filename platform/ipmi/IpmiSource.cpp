@@ -75,10 +75,16 @@ std::string IpmiSource::entryPath(std::uint32_t run, std::uint16_t recordId)
 
 std::shared_ptr<const NodeTree> IpmiSource::snapshot()
 {
+    // A second cursor of the same request walks the tree the BMC confirmed
+    // for the first one.
+    if (std::shared_ptr<const NodeTree> held = handed_.held())
+    {
+        return held;
+    }
     try
     {
         const BmcGate::Access access(gate_);
-        return refreshTree();
+        return handed_.handOut(refreshTree());
     }
     catch (const IpmiError& error)
     {
@@ -302,12 +308,8 @@ void IpmiSource::clearSel()
         std::filesystem::remove(selCopy_.file, ignored);
         copyWritten_.reset();
     }
+    handed_.forget();
     cache_.erase(*bmc_);
-}
-
-std::string IpmiSource::printablePath(const std::string& path) const
-{
-    return "IPMI:" + path;
 }
 
 void IpmiSource::startMonitoring(NodeLexicon::NodeType kind,

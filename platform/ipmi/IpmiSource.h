@@ -6,6 +6,7 @@
 #include "IpmiSettings.h"
 #include "NodeTree.h"
 #include "RecordDescriber.h"
+#include "RequestSnapshot.h"
 #include "SelCache.h"
 #include "SelFill.h"
 #include "SelMonitor.h"
@@ -31,9 +32,11 @@ namespace QX::Ipmi
  * request of a process loads it and has the BMC confirm it like any later
  * request, and every change of the copy is written back.
  *
- * Every snapshot asks the BMC whether its SEL changed (SelCache) and hands
- * out the same immutable tree while it has not; added records are added
- * to the tree without reading the others again. One request at a time
+ * Every request asks the BMC whether its SEL changed (SelCache) and is
+ * handed the same immutable tree while it has not; added records are
+ * added to the tree without reading the others again. The cursors of one
+ * request share the tree its first cursor was handed (RequestSnapshot):
+ * the BMC is asked once per request, not once per cursor. One request at a time
  * talks to the BMC (BmcGate); the others wait while it makes progress.
  * The SEL copy and the session are meant to be shared by everything in
  * the process that reads the BMC, alert polling included.
@@ -75,7 +78,6 @@ class IpmiSource : public InstrumentationSource
     bool writeProperty(const std::string& path,
                        NodeLexicon::Properties property,
                        unsigned value) override;
-    std::string printablePath(const std::string& path) const override;
     void startMonitoring(NodeLexicon::NodeType kind, MonitorCallback callback,
                          const void* context) override;
     void stopMonitoring(NodeLexicon::NodeType kind, MonitorCallback callback,
@@ -143,6 +145,7 @@ class IpmiSource : public InstrumentationSource
     };
     std::optional<CopyStamp> copyStamp_;
     bool copyFailing_ = false;
+    RequestSnapshot handed_;
 
     SelMonitor monitor_; // last: its poller stops before the rest goes
 };

@@ -3,6 +3,7 @@
 #include "AtomicFile.h"
 
 #include <algorithm>
+#include <array>
 #include <stdexcept>
 
 namespace QX::Ipmi
@@ -114,6 +115,46 @@ class Cursor
     std::size_t at_ = 0;
 };
 
+// The Get SEL Info fields and the flags, in file order with their widths:
+// the writer and the reader both go through this one list.
+enum InfoField
+{
+    infoEntries,
+    infoFreeSpace,
+    infoAddition,
+    infoErase,
+    infoFlags,
+    infoFieldCount,
+};
+constexpr std::array<unsigned, infoFieldCount> infoWidths{2, 2, 4, 4, 1};
+using InfoFields = std::array<std::uint64_t, infoFieldCount>;
+
+InfoFields infoFieldsOf(const KeptSel& copy)
+{
+    InfoFields fields{};
+    fields[infoEntries] = copy.info.entries;
+    fields[infoFreeSpace] = copy.info.freeSpace;
+    fields[infoAddition] = copy.info.mostRecentAddition;
+    fields[infoErase] = copy.info.mostRecentErase;
+    fields[infoFlags] = (copy.info.overflow ? flagOverflow : 0) |
+                        (copy.info.reserveSupported ? flagReserve : 0) |
+                        (copy.clearSeen ? flagClearSeen : 0);
+    return fields;
+}
+
+void applyInfoFields(const InfoFields& fields, KeptSel& copy)
+{
+    copy.info.entries = static_cast<std::uint16_t>(fields[infoEntries]);
+    copy.info.freeSpace = static_cast<std::uint16_t>(fields[infoFreeSpace]);
+    copy.info.mostRecentAddition =
+        static_cast<std::uint32_t>(fields[infoAddition]);
+    copy.info.mostRecentErase = static_cast<std::uint32_t>(fields[infoErase]);
+    const std::uint64_t flags = fields[infoFlags];
+    copy.info.overflow = (flags & flagOverflow) != 0;
+    copy.info.reserveSupported = (flags & flagReserve) != 0;
+    copy.clearSeen = (flags & flagClearSeen) != 0;
+}
+
 } // namespace
 
 std::string formatSelCopy(const KeptSel& copy)
@@ -133,14 +174,11 @@ std::string formatSelCopy(const KeptSel& copy)
     put(out, selCopyVersion, 4);
     put(out, copy.bmcKey.size(), 2);
     out += copy.bmcKey;
-    put(out, copy.info.entries, 2);
-    put(out, copy.info.freeSpace, 2);
-    put(out, copy.info.mostRecentAddition, 4);
-    put(out, copy.info.mostRecentErase, 4);
-    const std::uint8_t flags = (copy.info.overflow ? flagOverflow : 0) |
-                               (copy.info.reserveSupported ? flagReserve : 0) |
-                               (copy.clearSeen ? flagClearSeen : 0);
-    put(out, flags, 1);
+    const InfoFields info = infoFieldsOf(copy);
+    for (std::size_t i = 0; i < info.size(); ++i)
+    {
+        put(out, info[i], infoWidths[i]);
+    }
     put(out, copy.records.size(), 4);
     for (const SelRecordBytes& record : copy.records)
     {
@@ -207,15 +245,17 @@ std::optional<KeptSel> parseSelCopy(std::string_view bytes,
     tail.take(checksumSize, checksum);
 
     KeptSel copy;
-    std::uint64_t entries = 0;
-    std::uint64_t freeSpace = 0;
-    std::uint64_t addition = 0;
-    std::uint64_t erase = 0;
-    std::uint64_t flags = 0;
+    InfoFields info{};
     std::uint64_t count = 0;
-    if (!cursor.take(2, entries) || !cursor.take(2, freeSpace) ||
-        !cursor.take(4, addition) || !cursor.take(4, erase) ||
-        !cursor.take(1, flags) || !cursor.take(4, count))
+    for (std::size_t i = 0; i < info.size(); ++i)
+    {
+        if (!cursor.take(infoWidths[i], info[i]))
+        {
+            problem = "the file is truncated";
+            return std::nullopt;
+        }
+    }
+    if (!cursor.take(4, count))
     {
         problem = "the file is truncated";
         return std::nullopt;
@@ -236,7 +276,7 @@ std::optional<KeptSel> parseSelCopy(std::string_view bytes,
         problem = "the length does not match the record count";
         return std::nullopt;
     }
-    if ((flags & ~std::uint64_t{knownFlags}) != 0)
+    if ((info[infoFlags] & ~std::uint64_t{knownFlags}) != 0)
     {
         problem = "unknown flags";
         return std::nullopt;
@@ -247,13 +287,7 @@ std::optional<KeptSel> parseSelCopy(std::string_view bytes,
         return std::nullopt;
     }
     copy.bmcKey = std::string(key);
-    copy.info.entries = static_cast<std::uint16_t>(entries);
-    copy.info.freeSpace = static_cast<std::uint16_t>(freeSpace);
-    copy.info.mostRecentAddition = static_cast<std::uint32_t>(addition);
-    copy.info.mostRecentErase = static_cast<std::uint32_t>(erase);
-    copy.info.overflow = (flags & flagOverflow) != 0;
-    copy.info.reserveSupported = (flags & flagReserve) != 0;
-    copy.clearSeen = (flags & flagClearSeen) != 0;
+    applyInfoFields(info, copy);
     copy.records.resize(count);
     for (SelRecordBytes& record : copy.records)
     {

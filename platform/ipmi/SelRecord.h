@@ -131,14 +131,12 @@ inline SelRecord SelRecord::systemEvent(std::uint16_t recordId,
                                         std::uint8_t eventDirType,
                                         std::array<std::uint8_t, 3> eventData)
 {
-    SelRecord record;
-    record.recordId = recordId;
-    record.timestamp = timestamp;
-    record.sensorType = sensorType;
-    record.sensorNumber = sensorNumber;
-    record.eventDirType = eventDirType;
-    record.eventData = eventData;
-    return record;
+    return SelRecord{.recordId = recordId,
+                     .timestamp = timestamp,
+                     .sensorType = sensorType,
+                     .sensorNumber = sensorNumber,
+                     .eventDirType = eventDirType,
+                     .eventData = eventData};
 }
 
 inline SelRecord SelRecord::parse(const SelRecordBytes& bytes)

@@ -4,6 +4,7 @@
 // data (never the built-in sample) and one line says what is missing. A
 // platform that cannot be set up at all fails a subscription's watch with
 // a line in the log as well.
+#include "CaptureSink.h"
 #include "Configuration.h"
 #include "EntryFixture.h"
 
@@ -177,7 +178,7 @@ TEST_F(DefaultSource, AWatchThePlatformCannotStartIsAFailureInTheLog)
                       ("broken-" + std::to_string(::getpid()) + ".conf");
     std::ofstream(file) << "source = bmc\n";
     ::setenv(QX::Platform::configurationPathVariable, file.c_str(), 1);
-    const auto capture = std::make_shared<CVLog::CaptureSink>();
+    const auto capture = std::make_shared<testsupport::CaptureSink>();
     const CVLog::LoggerSettings previous = CVLog::CVLogger::settings();
     CVLog::CVLogger::setSink(capture);
     CVLog::CVLogger::configure(CVLog::LoggerSettings{});

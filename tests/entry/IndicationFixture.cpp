@@ -36,7 +36,7 @@ void WatchdogSourceTest::TearDown()
 void IndicationTest::SetUp()
 {
     ProviderTest::SetUp();
-    capture = std::make_shared<CVLog::CaptureSink>();
+    capture = std::make_shared<testsupport::CaptureSink>();
     CVLog::CVLogger::setSink(capture);
     CVLog::LoggerSettings everything;
     everything.logLevel = 1;

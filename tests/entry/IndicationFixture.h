@@ -1,6 +1,7 @@
 #pragma once
 
 #include "CVLogger.h"
+#include "CaptureSink.h"
 #include "DateTime.h"
 #include "EntryFixture.h"
 #include "EventClasses.h"
@@ -55,7 +56,7 @@ class IndicationTest : public ProviderTest
     std::vector<CVLog::LogRecord> linesWith(const std::string& text) const;
 
     std::unique_ptr<host::IndicationInbox> inbox;
-    std::shared_ptr<CVLog::CaptureSink> capture;
+    std::shared_ptr<testsupport::CaptureSink> capture;
 };
 
 /**

@@ -43,16 +43,25 @@ void InbandTest::TearDown()
 
 void InbandTest::load(unsigned timeoutMs, unsigned pollMs)
 {
+    loadWith("ipmi.driver = openipmi\n"
+             "ipmi.driver-device = " +
+             devicePath + "\nipmi.timeout = " + std::to_string(timeoutMs) +
+             "\nipmi.poll-interval = " + std::to_string(pollMs) + "\n");
+}
+
+void InbandTest::loadProbing()
+{
+    loadWith("ipmi.driver = auto\n");
+}
+
+void InbandTest::loadWith(const std::string& settings)
+{
     const std::string file = directory + "/platform.conf";
     {
         std::ofstream out(file);
         out << "source = ipmi\n"
             << "ipmi.interface = inband\n"
-            << "ipmi.driver = openipmi\n"
-            << "ipmi.driver-device = " << devicePath << "\n"
-            << "ipmi.timeout = " << timeoutMs << "\n"
-            << "ipmi.poll-interval = " << pollMs << "\n"
-            << "ipmi.state-directory = " << directory << "/state\n"
+            << settings << "ipmi.state-directory = " << directory << "/state\n"
             << "log.sink = none\n";
     }
     ASSERT_EQ(
@@ -113,6 +122,16 @@ host::Outcome InbandTest::enumerate(const std::string& className)
     return testrequests::enumerate(*host_, className);
 }
 
+host::Outcome InbandTest::loadAndEnumerate(unsigned records,
+                                           const std::string& className)
+{
+    addRecords(records);
+    load();
+    host::Outcome outcome = enumerate(className);
+    EXPECT_EQ(outcome.rc, CMPI_RC_OK) << outcome.message.value_or("");
+    return outcome;
+}
+
 host::Outcome InbandTest::clearLog()
 {
     return testrequests::clearLog(*host_);
@@ -124,9 +143,9 @@ inbandsim::Record temperatureRecord(std::uint8_t reading)
                                      {0x01, 0x30, 0x01, 0x57, reading, 0x50});
 }
 
-std::size_t exchangeWorkers()
+std::set<std::string> exchangeWorkerIds()
 {
-    std::size_t count = 0;
+    std::set<std::string> ids;
     std::error_code error;
     for (const auto& task :
          std::filesystem::directory_iterator("/proc/self/task", error))
@@ -136,10 +155,15 @@ std::size_t exchangeWorkers()
         std::getline(comm, name);
         if (name == QX::Ipmi::ExchangeWorker::threadName)
         {
-            ++count;
+            ids.insert(task.path().filename().string());
         }
     }
-    return count;
+    return ids;
+}
+
+std::size_t exchangeWorkers()
+{
+    return exchangeWorkerIds().size();
 }
 
 std::size_t exchangeWorkersAfterGrace()

@@ -12,6 +12,7 @@
 
 #include <chrono>
 #include <memory>
+#include <set>
 #include <string>
 
 #include <gtest/gtest.h>
@@ -30,6 +31,9 @@ class InbandTest : public ::testing::Test
 
     /** Writes the configuration and loads the provider. */
     void load(unsigned timeoutMs = 1000, unsigned pollMs = 150);
+    /** Loads the provider on a platform that probes for an in-band BMC
+     *  itself, as an installed one does. */
+    void loadProbing();
     /** Unloads the provider as an object manager does, then ends the
      *  platform's source, as unloading the platform library does. */
     void unload();
@@ -51,12 +55,19 @@ class InbandTest : public ::testing::Test
     std::uint16_t addThroughDriver(const inbandsim::Record& record);
 
     host::Outcome enumerate(const std::string& className);
+    /** Adds @p records records, loads the provider and enumerates
+     *  @p className, expecting the request to succeed. */
+    host::Outcome loadAndEnumerate(unsigned records,
+                                   const std::string& className);
     host::Outcome clearLog();
 
     std::string directory;
     std::string devicePath;
 
   private:
+    /** Writes @p settings as the configuration and loads the provider. */
+    void loadWith(const std::string& settings);
+
     std::unique_ptr<inbandsim::IpmiDevice> device_;
     std::unique_ptr<host::Host> host_;
 };
@@ -64,7 +75,9 @@ class InbandTest : public ::testing::Test
 /** A temperature event record (the BMC sets id and time). */
 inbandsim::Record temperatureRecord(std::uint8_t reading);
 
-/** Threads of this process named as the in-band exchange worker. */
+/** Thread ids of this process named as the in-band exchange worker. */
+std::set<std::string> exchangeWorkerIds();
+/** How many threads of this process are named as the exchange worker. */
 std::size_t exchangeWorkers();
 /** Exchange workers left after a short grace: a joined thread may still
  *  be listed for a moment while the kernel takes it down. */

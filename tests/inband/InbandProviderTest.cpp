@@ -20,11 +20,7 @@ using ::testing::HasSubstr;
 
 TEST_F(InbandTest, EntriesAreTheRecordsOfTheBmc)
 {
-    addRecords(3);
-    load();
-
-    const host::Outcome outcome = enumerate("ZAN_MgmtHwLogEntry");
-    ASSERT_EQ(outcome.rc, CMPI_RC_OK) << outcome.message.value_or("");
+    const host::Outcome outcome = loadAndEnumerate(3, "ZAN_MgmtHwLogEntry");
     const auto records =
         device().withBmc([](inbandsim::RawBmc& bmc) { return bmc.records(); });
     ASSERT_EQ(outcome.instances.size(), records.size());
@@ -40,11 +36,7 @@ TEST_F(InbandTest, EntriesAreTheRecordsOfTheBmc)
 
 TEST_F(InbandTest, LogNamesTheInbandBmc)
 {
-    addRecords(2);
-    load();
-
-    const host::Outcome outcome = enumerate("ZAN_MgmtHwLog");
-    ASSERT_EQ(outcome.rc, CMPI_RC_OK) << outcome.message.value_or("");
+    const host::Outcome outcome = loadAndEnumerate(2, "ZAN_MgmtHwLog");
     ASSERT_EQ(outcome.instances.size(), 1u);
     EXPECT_EQ(text(outcome.instances[0], "Name"), "IPMI SEL Log");
     const host::Value* count =
@@ -55,11 +47,7 @@ TEST_F(InbandTest, LogNamesTheInbandBmc)
 
 TEST_F(InbandTest, GetReturnsTheEnumeratedEntry)
 {
-    addRecords(4);
-    load();
-
-    const host::Outcome all = enumerate("ZAN_MgmtHwLogEntry");
-    ASSERT_EQ(all.rc, CMPI_RC_OK) << all.message.value_or("");
+    const host::Outcome all = loadAndEnumerate(4, "ZAN_MgmtHwLogEntry");
     ASSERT_EQ(all.instances.size(), 4u);
     const host::Instance& wanted = all.instances[2];
 
@@ -74,9 +62,7 @@ TEST_F(InbandTest, GetReturnsTheEnumeratedEntry)
 
 TEST_F(InbandTest, ClearLogEmptiesTheBmcsSel)
 {
-    addRecords(5);
-    load();
-    ASSERT_EQ(enumerate("ZAN_MgmtHwLogEntry").instances.size(), 5u);
+    ASSERT_EQ(loadAndEnumerate(5, "ZAN_MgmtHwLogEntry").instances.size(), 5u);
 
     const host::Outcome cleared = clearLog();
     ASSERT_EQ(cleared.rc, CMPI_RC_OK) << cleared.message.value_or("");

@@ -6,8 +6,6 @@
 
 #include <atomic>
 #include <chrono>
-#include <filesystem>
-#include <fstream>
 #include <set>
 #include <thread>
 
@@ -22,25 +20,6 @@ using ::testing::HasSubstr;
 using Clock = std::chrono::steady_clock;
 
 constexpr unsigned timeoutMs = 400;
-
-/** The thread ids named as exchange workers now. */
-std::set<std::string> workerIds()
-{
-    std::set<std::string> ids;
-    std::error_code error;
-    for (const auto& task :
-         std::filesystem::directory_iterator("/proc/self/task", error))
-    {
-        std::ifstream comm(task.path() / "comm");
-        std::string name;
-        std::getline(comm, name);
-        if (name == "ipmi-exchange")
-        {
-            ids.insert(task.path().filename().string());
-        }
-    }
-    return ids;
-}
 
 TEST_F(InbandTest, SilentBmcEndsTheRequestWithinTheTimeout)
 {
@@ -97,7 +76,7 @@ TEST_F(InbandTest, OneWorkerReadsALargeLog)
         {
             while (reading.load())
             {
-                const std::set<std::string> now = workerIds();
+                const std::set<std::string> now = exchangeWorkerIds();
                 seen.insert(now.begin(), now.end());
                 std::this_thread::sleep_for(std::chrono::milliseconds(2));
             }
@@ -110,7 +89,7 @@ TEST_F(InbandTest, OneWorkerReadsALargeLog)
     EXPECT_EQ(outcome.instances.size(), 300u);
     EXPECT_GE(device().requests(), 300u);
     EXPECT_EQ(seen.size(), 1u) << "exchanges ran on more than one thread";
-    EXPECT_EQ(workerIds(), seen) << "the worker did not stay";
+    EXPECT_EQ(exchangeWorkerIds(), seen) << "the worker did not stay";
 }
 
 TEST_F(InbandTest, NoWorkerOutlivesAnUnload)

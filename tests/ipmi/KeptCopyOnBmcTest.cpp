@@ -89,6 +89,32 @@ TEST_F(KeptCopyOnBmcTest, UnchangedSelAfterARestartCostsAWarmLook)
     EXPECT_LE(enumerateAndCompare(), warm + 1);
 }
 
+TEST_F(KeptCopyOnBmcTest, OneEnumerationOfAnUnchangedSelAsksTheBmcOnce)
+{
+    start(generated(80));
+    // Requests back to back, so that the session stays open: a new
+    // session asks the restart cause again.
+    const auto cost = [this]
+    {
+        const std::uint64_t before = requests();
+        const auto outcome = enumerate("ZAN_MgmtHwLogEntry");
+        EXPECT_EQ(outcome.rc, CMPI_RC_OK);
+        EXPECT_EQ(outcome.instances.size(), 80u);
+        return requests() - before;
+    };
+    cost(); // reads the SEL and keeps the copy
+    // Get SEL Info and the newest record, once for the whole request
+    // although it walks the tree with two cursors.
+    EXPECT_EQ(cost(), 2u);
+    reload();
+    // A new load over the kept copy: the same two, and Get System Restart
+    // Cause once for the new session.
+    EXPECT_EQ(cost(), 3u);
+    EXPECT_EQ(cost(), 2u);
+    // And what it shows is the SEL ipmitool reads.
+    enumerateAndCompare();
+}
+
 TEST_F(KeptCopyOnBmcTest, RecordsAddedAndAClearMeanwhileAreSeen)
 {
     start(generated(60));

@@ -1,5 +1,7 @@
 #include "CVLogger.h"
 
+#include "CaptureSink.h"
+
 #include <cstdio>
 #include <fstream>
 #include <sstream>
@@ -62,7 +64,8 @@ class LoggerTest : public ::testing::Test
         return texts;
     }
 
-    std::shared_ptr<CaptureSink> capture_ = std::make_shared<CaptureSink>();
+    std::shared_ptr<testsupport::CaptureSink> capture_ =
+        std::make_shared<testsupport::CaptureSink>();
 
   private:
     std::shared_ptr<LogSink> previousSink_;

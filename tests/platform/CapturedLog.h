@@ -3,6 +3,7 @@
 // Captures every line the logger writes while one test runs.
 
 #include "CVLogger.h"
+#include "CaptureSink.h"
 
 #include <memory>
 #include <vector>
@@ -31,8 +32,8 @@ class CapturedLog
     }
 
   private:
-    std::shared_ptr<CVLog::CaptureSink> sink_ =
-        std::make_shared<CVLog::CaptureSink>();
+    std::shared_ptr<testsupport::CaptureSink> sink_ =
+        std::make_shared<testsupport::CaptureSink>();
     std::shared_ptr<CVLog::LogSink> previous_;
 };
 

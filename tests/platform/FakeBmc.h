@@ -8,7 +8,9 @@
 #include "ipmi/BmcCommands.h"
 #include "ipmi/IpmiError.h"
 #include "ipmi/RecordDescriber.h"
+#include "ipmi/SelCache.h"
 #include "ipmi/SelRecord.h"
+#include "support/LocalBmc.h"
 
 #include <algorithm>
 #include <cstdint>
@@ -38,7 +40,23 @@ inline Ipmi::SelRecordBytes logClearedRecord(std::uint16_t id)
         .bytes();
 }
 
-class FakeBmc : public Ipmi::BmcCommands
+/** Appends @p bytes to @p records as the SEL copy holds them: the id read
+ *  from the record, the run counted on where the id does not go up. */
+inline void appendCached(std::vector<Ipmi::CachedRecord>& records,
+                         const Ipmi::SelRecordBytes& bytes)
+{
+    Ipmi::CachedRecord record;
+    record.id = Ipmi::SelRecord::parse(bytes).recordId;
+    if (!records.empty())
+    {
+        const Ipmi::CachedRecord& last = records.back();
+        record.run = record.id > last.id ? last.run : last.run + 1;
+    }
+    record.bytes = bytes;
+    records.push_back(std::move(record));
+}
+
+class FakeBmc : public LocalBmc
 {
   public:
     std::vector<Ipmi::SelRecordBytes> sel;
@@ -47,7 +65,6 @@ class FakeBmc : public Ipmi::BmcCommands
     std::uint32_t lastErase = 0;
     bool overflow = false;
     std::optional<std::uint8_t> restartCause;
-    std::uint64_t generation = 1;
 
     // Faults: cancel the reservation at the n-th Get SEL Entry from now
     // (0: the next), or at every one.
@@ -83,14 +100,12 @@ class FakeBmc : public Ipmi::BmcCommands
     {
         fail();
         ++selInfoCalls;
-        Ipmi::SelInfo info;
-        info.entries = static_cast<std::uint16_t>(sel.size());
-        info.freeSpace = freeSpace;
-        info.mostRecentAddition = lastAddition;
-        info.mostRecentErase = lastErase;
-        info.overflow = overflow;
-        info.reserveSupported = true;
-        return info;
+        return Ipmi::SelInfo{.entries = static_cast<std::uint16_t>(sel.size()),
+                             .freeSpace = freeSpace,
+                             .mostRecentAddition = lastAddition,
+                             .mostRecentErase = lastErase,
+                             .overflow = overflow,
+                             .reserveSupported = true};
     }
     std::uint16_t reserveSel() override
     {
@@ -170,14 +185,6 @@ class FakeBmc : public Ipmi::BmcCommands
         fail();
         ++restartCauseCalls;
         return restartCause;
-    }
-    std::uint64_t sessionGeneration() const override
-    {
-        return generation;
-    }
-    std::chrono::steady_clock::time_point lastActivity() const override
-    {
-        return std::chrono::steady_clock::now();
     }
 
   private:

@@ -111,22 +111,77 @@ TEST_F(IpmiSourceTest, UnchangedSelGivesTheSameTree)
 {
     initial = {selRecord(1), selRecord(2)};
     make();
-    const auto first = source->snapshot();
+    // Each snapshot stands for a request of its own: the first is let go.
+    const NodeTree* const first = source->snapshot().get();
     bmc->resetCounters();
     const auto second = source->snapshot();
-    EXPECT_EQ(first, second);
+    EXPECT_EQ(second.get(), first);
     // Get SEL Info and the newest record.
     EXPECT_EQ(bmc->exchanges(), 2u);
+}
+
+TEST_F(IpmiSourceTest, CursorsOfOneRequestShareOneLookAtTheBmc)
+{
+    initial = {selRecord(1), selRecord(2)};
+    make();
+    source->snapshot();
+    bmc->resetCounters();
+    {
+        Instrumentation logCursor(source);
+        Instrumentation entryCursor(source);
+        logCursor.selectNode(EventLog);
+        entryCursor.selectNode(EventLogEntry);
+        EXPECT_TRUE(entryCursor);
+        // Get SEL Info and the newest record, for both cursors.
+        EXPECT_EQ(bmc->exchanges(), 2u);
+        // Another thread's request looks again.
+        std::thread other(
+            [this]
+            {
+                Instrumentation cursor(source);
+                cursor.selectNode(EventLog);
+            });
+        other.join();
+        EXPECT_EQ(bmc->exchanges(), 4u);
+    }
+    // The cursors are gone: the next request looks again and sees a
+    // record added meanwhile.
+    bmc->add(selRecord(3));
+    Instrumentation next(source);
+    next.selectNode(EventLogEntry);
+    EXPECT_GT(bmc->exchanges(), 4u);
+    unsigned entries = 0;
+    for (; next; ++next)
+    {
+        ++entries;
+    }
+    EXPECT_EQ(entries, 3u);
+}
+
+TEST_F(IpmiSourceTest, ClearingTheLogEndsTheSharedLook)
+{
+    initial = {selRecord(1), selRecord(2)};
+    make();
+    Instrumentation held(source);
+    held.selectNode(EventLogEntry);
+    ASSERT_TRUE(held);
+    ASSERT_TRUE(source->writeProperty(IpmiSource::controllerPath, Command,
+                                      ClearEventLogCommand));
+    Instrumentation after(source);
+    after.selectNode(EventLogEntry);
+    EXPECT_FALSE(after);
 }
 
 TEST_F(IpmiSourceTest, AddedRecordsExtendTheTree)
 {
     initial = {selRecord(1)};
     make();
-    const auto before = source->snapshot();
+    // Each snapshot stands for a request of its own: the first is let go.
+    const std::size_t before =
+        source->snapshot()->nodesOfKind(EventLogEntry).size();
     bmc->add(selRecord(2));
     const auto after = source->snapshot();
-    EXPECT_EQ(before->nodesOfKind(EventLogEntry).size(), 1u);
+    EXPECT_EQ(before, 1u);
     EXPECT_EQ(after->nodesOfKind(EventLogEntry).size(), 2u);
 }
 
@@ -270,11 +325,13 @@ TEST_F(IpmiSourceTest, RestartCauseIsReadOncePerSessionOrSelChange)
 {
     make();
     bmc->restartCause = 4; // watchdog
-    Instrumentation cursor(source);
-    cursor.selectNode(Watchdog);
-    unsigned cause = 0;
-    ASSERT_TRUE(cursor.getProperty(RestartCause, cause));
-    EXPECT_EQ(cause, 4u);
+    {
+        Instrumentation cursor(source);
+        cursor.selectNode(Watchdog);
+        unsigned cause = 0;
+        ASSERT_TRUE(cursor.getProperty(RestartCause, cause));
+        EXPECT_EQ(cause, 4u);
+    }
     bmc->resetCounters();
     source->snapshot();
     EXPECT_EQ(bmc->restartCauseCalls, 0u);

@@ -43,13 +43,7 @@ class SelAlertTrackerTest : public ::testing::Test
   protected:
     void add(const SelRecordBytes& bytes)
     {
-        CachedRecord record;
-        record.id = static_cast<std::uint16_t>(bytes[0] | bytes[1] << 8);
-        record.run = records.empty() || record.id > records.back().id
-                         ? (records.empty() ? 0 : records.back().run)
-                         : records.back().run + 1;
-        record.bytes = bytes;
-        records.push_back(record);
+        test::appendCached(records, bytes);
         ++addition;
         ++version;
     }

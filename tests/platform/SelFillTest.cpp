@@ -11,15 +11,13 @@
 using namespace QX;
 using namespace QX::Ipmi;
 using namespace QX::NodeLexicon;
-using QX::test::logClearedRecord;
-using QX::test::selRecord;
 
 namespace
 {
 
 SelRecordBytes loggingDisabled(std::uint16_t id, std::uint8_t offset)
 {
-    SelRecordBytes record = logClearedRecord(id);
+    SelRecordBytes record = test::logClearedRecord(id);
     record[13] = offset;
     return record;
 }
@@ -29,17 +27,15 @@ class SelFillTest : public ::testing::Test
   protected:
     void add(const SelRecordBytes& bytes)
     {
-        CachedRecord record;
-        record.id = static_cast<std::uint16_t>(bytes[0] | bytes[1] << 8);
-        record.bytes = bytes;
-        records.push_back(record);
+        test::appendCached(records, bytes);
         info.entries = static_cast<std::uint16_t>(records.size());
     }
     void addRecords(unsigned count)
     {
         for (unsigned i = 0; i < count; ++i)
         {
-            add(selRecord(static_cast<std::uint16_t>(records.size() + 1)));
+            add(test::selRecord(
+                static_cast<std::uint16_t>(records.size() + 1)));
         }
     }
     LogState state(bool clearSeen = false) const
@@ -88,7 +84,7 @@ TEST_F(SelFillTest, FillRecordsAreAFillSignalOfTheirOwn)
     EXPECT_EQ(state().status, EventLogStatusFull);
     // Deasserted, they say nothing; after a clear, the old ones neither.
     records.clear();
-    add(logClearedRecord(1));
+    add(test::logClearedRecord(1));
     EXPECT_EQ(state().status, 1u);
     SelRecordBytes deasserted = loggingDisabled(2, 0x04);
     deasserted[12] = 0xef;
@@ -104,7 +100,7 @@ TEST_F(SelFillTest, EmptiedSelIsClearedByEraseTimeOrByWhatWasSeen)
     EXPECT_EQ(state(true).status, EventLogStatusCleared);
     info.mostRecentErase = 0x65000000;
     EXPECT_EQ(state().status, EventLogStatusCleared);
-    add(logClearedRecord(1));
+    add(test::logClearedRecord(1));
     EXPECT_TRUE(state().isEmpty);
     EXPECT_EQ(state().status, EventLogStatusCleared);
 }

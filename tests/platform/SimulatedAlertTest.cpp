@@ -167,17 +167,20 @@ TEST_F(SimulatedAlertTest, ATreeWithoutLogCannotSimulate)
     }
 }
 
-/** A source of some other kind: it leaves simulation to the default. */
-class PlainSource : public MemorySource
+/** A source of some other kind: it has no way to simulate. */
+class PlainSource : public InstrumentationSource
 {
   public:
-    PlainSource() : MemorySource(nullptr) {}
-    void raiseSimulatedAlert(SimulatedAlert alert) override
+    std::shared_ptr<const NodeTree> snapshot() override
     {
-        // The base class's default is what these tests are about.
-        // NOLINTNEXTLINE(bugprone-parent-virtual-call)
-        InstrumentationSource::raiseSimulatedAlert(alert);
+        return NodeTreeBuilder().build();
     }
+    bool writeProperty(const std::string&, Properties, unsigned) override
+    {
+        return false;
+    }
+    void startMonitoring(NodeType, MonitorCallback, const void*) override {}
+    void stopMonitoring(NodeType, MonitorCallback, const void*) override {}
 };
 
 TEST(SimulatedAlerts, SourcesThatCannotSimulateSaySo)
@@ -185,7 +188,8 @@ TEST(SimulatedAlerts, SourcesThatCannotSimulateSaySo)
     Platform::overrideSource(std::make_shared<PlainSource>());
     try
     {
-        Platform::raiseSimulatedAlert(SimulatedAlert::WatchdogRestart);
+        raiseSimulatedAlert(*Platform::currentSource(),
+                            SimulatedAlert::WatchdogRestart);
         FAIL() << "no exception";
     }
     catch (const std::runtime_error& error)
@@ -201,7 +205,7 @@ TEST(SimulatedAlerts, ThePlatformRaisesOnItsCurrentSource)
 {
     auto source = std::make_shared<MemorySource>(test::twoControllerTree());
     Platform::overrideSource(source);
-    Platform::raiseSimulatedAlert(SimulatedAlert::LogFull);
+    raiseSimulatedAlert(*Platform::currentSource(), SimulatedAlert::LogFull);
     const auto tree = source->snapshot();
     EXPECT_EQ(tree->node(*tree->find("/bmc0/sel")).status, EventLogStatusFull);
     Platform::overrideSource(nullptr);

@@ -103,6 +103,25 @@ TEST_F(RestartProfilesTest, UnchangedSelIsConfirmedNotRead)
     EXPECT_EQ(cost.entries, warm.entries);
 }
 
+TEST_F(RestartProfilesTest, OneEnumerationOfAnUnchangedSelAsksTheBmcOnce)
+{
+    start(BmcProfile{});
+    addRecords(300);
+    readOnce();
+    // Get SEL Info and the newest record, once for the whole request
+    // although it walks the tree with two cursors.
+    const Cost warm = warmCost();
+    EXPECT_EQ(warm.requests, 2u);
+    EXPECT_EQ(warm.entries, 1u);
+    restart();
+    const Cost before = costNow();
+    expectEnumerationIsTheSel();
+    const Cost cost = costSince(before);
+    // The same, and Get System Restart Cause once for the new session.
+    EXPECT_EQ(cost.requests, 3u);
+    EXPECT_EQ(cost.entries, 1u);
+}
+
 TEST_F(RestartProfilesTest, UnchangedFrozenSelIsConfirmedNotRead)
 {
     start(frozen());

@@ -3,6 +3,7 @@
 // Reading the diagnostic lines a test captured.
 
 #include "CVLogger.h"
+#include "CaptureSink.h"
 
 #include <string>
 #include <vector>
@@ -12,7 +13,8 @@ namespace testsupport
 
 /** The captured records whose message contains @p text, in order. */
 inline std::vector<CVLog::LogRecord>
-recordsContaining(const CVLog::CaptureSink& capture, const std::string& text)
+recordsContaining(const testsupport::CaptureSink& capture,
+                  const std::string& text)
 {
     std::vector<CVLog::LogRecord> found;
     for (const auto& record : capture.records())

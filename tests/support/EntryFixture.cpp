@@ -70,7 +70,7 @@ void ProviderTest::install(const QX::NodeTreeBuilder& tree)
 void CapturingProviderTest::SetUp()
 {
     ProviderTest::SetUp();
-    capture_ = std::make_shared<CVLog::CaptureSink>();
+    capture_ = std::make_shared<testsupport::CaptureSink>();
     previous_ = CVLog::CVLogger::settings();
     CVLog::CVLogger::setSink(capture_);
     CVLog::LoggerSettings all;

@@ -1,6 +1,7 @@
 #pragma once
 
 #include "CVLogger.h"
+#include "CaptureSink.h"
 #include "Host.h"
 #include "MemorySource.h"
 #include "NodeTree.h"
@@ -64,7 +65,7 @@ class CapturingProviderTest : public ProviderTest
     void SetUp() override;
     void TearDown() override;
 
-    std::shared_ptr<CVLog::CaptureSink> capture_;
+    std::shared_ptr<testsupport::CaptureSink> capture_;
 
   private:
     CVLog::LoggerSettings previous_;

@@ -39,7 +39,7 @@ void addEntry(QX::NodeTreeBuilder& tree, const std::string& logPath,
 
 void PlatformTest::SetUp()
 {
-    capture = std::make_shared<CVLog::CaptureSink>();
+    capture = std::make_shared<testsupport::CaptureSink>();
     previousSettings_ = CVLog::CVLogger::settings();
     previousSink_ = CVLog::CVLogger::setSink(capture);
     CVLog::LoggerSettings everything;

@@ -1,6 +1,7 @@
 #pragma once
 
 #include "CVLogger.h"
+#include "CaptureSink.h"
 #include "MemorySource.h"
 #include "NodeTree.h"
 #include "Platform.h"
@@ -40,7 +41,7 @@ class PlatformTest : public ::testing::Test
     recordsContaining(const std::string& text) const;
 
     std::shared_ptr<QX::MemorySource> source;
-    std::shared_ptr<CVLog::CaptureSink> capture;
+    std::shared_ptr<testsupport::CaptureSink> capture;
 
   private:
     std::shared_ptr<CVLog::LogSink> previousSink_;

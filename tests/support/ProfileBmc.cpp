@@ -123,9 +123,9 @@ void ProfileBmc::finishErase()
 {
     sel_.clear();
     freedIds_.clear();
-    overflow_ = false;
+    logged_.overflow = false;
     wrapped_ = false;
-    ++erase_;
+    ++logged_.mostRecentErase;
     if (profile_.clearedRecordAfterErase)
     {
         nextId_ = 1;
@@ -155,13 +155,13 @@ void ProfileBmc::store(Ipmi::SelRecordBytes record)
     {
         if (!profile_.ringBuffer)
         {
-            overflow_ = !profile_.overflowNeverSet;
+            logged_.overflow = !profile_.overflowNeverSet;
             return;
         }
         sel_.erase(sel_.begin());
     }
     sel_.push_back(record);
-    ++addition_;
+    ++logged_.mostRecentAddition;
     if (profile_.ringBuffer && profile_.rolloverRecord && !wrapped_ &&
         sel_.size() >= profile_.capacity)
     {
@@ -257,7 +257,9 @@ Ipmi::SelInfo ProfileBmc::getSelInfo()
 {
     const Lock lock = exchange();
     ++selInfoCalls_;
-    Ipmi::SelInfo info;
+    // The times and the overflow flag as the BMC keeps them; the rest as
+    // the profile answers.
+    Ipmi::SelInfo info = logged_;
     info.entries =
         static_cast<std::uint16_t>(sel_.size() + profile_.countExcess);
     const std::size_t left =
@@ -277,20 +279,20 @@ Ipmi::SelInfo ProfileBmc::getSelInfo()
     }
     constexpr std::uint32_t bootAddition = 0x64f00000;
     constexpr std::uint32_t bootErase = 0x64e00000;
-    info.mostRecentAddition =
-        profile_.frozenTimestamps ? bootAddition : addition_;
+    if (profile_.frozenTimestamps)
+    {
+        info.mostRecentAddition = bootAddition;
+        info.mostRecentErase = bootErase;
+    }
     if (profile_.additionIsNewestTime)
     {
         info.mostRecentAddition =
             sel_.empty() ? bootAddition : timeOf(sel_.back());
     }
-    info.mostRecentErase = profile_.frozenTimestamps ? bootErase : erase_;
     if (profile_.eraseTimeUnset)
     {
         info.mostRecentErase = eraseTimeUnset;
     }
-    info.overflow = overflow_;
-    info.reserveSupported = true;
     return info;
 }
 
@@ -405,16 +407,6 @@ std::optional<std::uint8_t> ProfileBmc::getSystemRestartCause()
 {
     const Lock lock = exchange();
     return std::nullopt;
-}
-
-std::uint64_t ProfileBmc::sessionGeneration() const
-{
-    return 1;
-}
-
-std::chrono::steady_clock::time_point ProfileBmc::lastActivity() const
-{
-    return std::chrono::steady_clock::now();
 }
 
 std::uint64_t ProfileBmc::requestCount() const

@@ -7,6 +7,7 @@
 // refused reservations, slow answers. Thread-safe: a test changes the SEL
 // while the source's poller reads it.
 
+#include "LocalBmc.h"
 #include "ipmi/BmcCommands.h"
 #include "ipmi/IpmiError.h"
 #include "ipmi/RecordDescriber.h"
@@ -75,7 +76,7 @@ struct BmcProfile
     std::chrono::milliseconds slowTakes{0};
 };
 
-class ProfileBmc : public Ipmi::BmcCommands
+class ProfileBmc : public LocalBmc
 {
   public:
     explicit ProfileBmc(BmcProfile profile);
@@ -117,8 +118,6 @@ class ProfileBmc : public Ipmi::BmcCommands
     void initiateSelErase(std::uint16_t reservationId) override;
     bool selEraseCompleted(std::uint16_t reservationId) override;
     std::optional<std::uint8_t> getSystemRestartCause() override;
-    std::uint64_t sessionGeneration() const override;
-    std::chrono::steady_clock::time_point lastActivity() const override;
     std::uint64_t requestCount() const override;
 
   private:
@@ -139,9 +138,10 @@ class ProfileBmc : public Ipmi::BmcCommands
     std::vector<std::uint16_t> freedIds_;
     std::uint16_t nextId_ = 1;
     std::uint32_t clock_ = 0x65e58300;
-    std::uint32_t addition_ = 0x65000000;
-    std::uint32_t erase_ = 0x64000000;
-    bool overflow_ = false;
+    // Last addition and erase times and the overflow flag.
+    Ipmi::SelInfo logged_{.mostRecentAddition = 0x65000000,
+                          .mostRecentErase = 0x64000000,
+                          .reserveSupported = true};
     bool wrapped_ = false;
     std::uint16_t reservation_ = 0;
     std::optional<std::chrono::steady_clock::time_point> erasingUntil_;

@@ -62,7 +62,8 @@ std::string selModuleLine(const SelBehaviour& behaviour, unsigned maxRecords,
            " frozen=" + (behaviour.frozenInfo ? "1" : "0") +
            " clear-ms=" + std::to_string(behaviour.clearMs) +
            " clear-record=" + (behaviour.clearRecord ? "1" : "0") +
-           " reserve=" + reserve + "\"\n";
+           " reserve=" + reserve +
+           " delay-ms=" + std::to_string(behaviour.delayMs) + "\"\n";
 }
 
 void writeSelFile(const std::string& selFile,

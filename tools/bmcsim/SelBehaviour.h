@@ -29,6 +29,8 @@ struct SelBehaviour
     bool clearRecord = false;
     /** Reserve SEL's completion code: 0 grants, C1h or D4h refuse. */
     std::uint8_t reserveRefusal = 0;
+    /** Every SEL command is answered this many ms late (0: at once). */
+    unsigned delayMs = 0;
 
     /** Ring buffer whose Get SEL Info times never change. */
     static SelBehaviour frozenRing();

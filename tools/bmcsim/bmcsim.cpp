@@ -5,12 +5,15 @@
 //                [--fixture FILE | --sample | --generate N]
 //                [--sel-behaviour frozen-ring | background-clear |
 //                                 reserve-c1 | reserve-d4]
+//                [--sel-delay-ms N]
 //       starts ipmi_sim on a free loopback port with the project's
 //       configuration in DIR and prints "host=127.0.0.1:PORT" and
 //       "pid=PID"; the simulator keeps running. --sel-behaviour gives it
 //       the SEL of some real BMCs (the SEL module): a full ring buffer
 //       whose Get SEL Info never changes, a Clear SEL that erases for 3 s
 //       in the background, or Reserve SEL refused with C1h or D4h
+//       --sel-delay-ms N: the SEL module answers every SEL command N ms
+//       late, as a real BMC over a LAN does (with any SEL behaviour)
 //   bmcsim add --dir DIR --count N     adds N records over IPMI
 //   bmcsim clear --dir DIR             clears the SEL over IPMI
 //   bmcsim watchdog --dir DIR [--tenths N]
@@ -38,6 +41,7 @@ constexpr const char* usage =
     "                    [--fixture FILE | --sample | --generate N]\n"
     "                    [--sel-behaviour frozen-ring | background-clear |\n"
     "                                     reserve-c1 | reserve-d4]\n"
+    "                    [--sel-delay-ms N]\n"
     "       bmcsim add --dir DIR --count N\n"
     "       bmcsim clear --dir DIR\n"
     "       bmcsim watchdog --dir DIR [--tenths N]\n"
@@ -226,6 +230,12 @@ int main(int argc, char** argv)
         if (options.count("--sel-behaviour"))
         {
             settings.selBehaviour = selBehaviour(options["--sel-behaviour"]);
+        }
+        if (options.count("--sel-delay-ms"))
+        {
+            // The SEL module's SEL, answering each SEL command late.
+            settings.selBehaviour.replaced = true;
+            settings.selBehaviour.delayMs = number(options["--sel-delay-ms"]);
         }
         settings.sensors = bmcsim::sampleSensors();
         bmcsim::SimulatedBmc bmc(settings);

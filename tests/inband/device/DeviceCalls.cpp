@@ -41,6 +41,7 @@ extern "C"
         {
             return inbandsim::IpmiDevice::open();
         }
+        inbandsim::IpmiDevice::passedOn(path);
         static const auto forward =
             next<int (*)(const char*, int, ...)>("open");
         return forward(path, flags, mode);

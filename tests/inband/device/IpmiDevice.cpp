@@ -93,6 +93,32 @@ bool IpmiDevice::claims(const char* path)
     return device != nullptr && path != nullptr && device->path_ == path;
 }
 
+namespace
+{
+
+std::mutex passedOnMutex;
+std::map<std::string, std::size_t> passedOnCounts;
+
+} // namespace
+
+void IpmiDevice::passedOn(const char* path)
+{
+    // Device nodes only: the count is of probes, not of every file the
+    // process opens.
+    if (path != nullptr && std::strncmp(path, "/dev/", 5) == 0)
+    {
+        const std::lock_guard lock(passedOnMutex);
+        ++passedOnCounts[path];
+    }
+}
+
+std::size_t IpmiDevice::passedOnOpens(const std::string& path)
+{
+    const std::lock_guard lock(passedOnMutex);
+    const auto found = passedOnCounts.find(path);
+    return found == passedOnCounts.end() ? 0 : found->second;
+}
+
 int IpmiDevice::open()
 {
     IpmiDevice* device = installed.load();

@@ -76,6 +76,11 @@ class IpmiDevice
     // call's result with errno set as the kernel would, or nothing when
     // the path or descriptor is not the device's.
     static bool claims(const char* path);
+    /** Notes an open of @p path that goes on to the C library. */
+    static void passedOn(const char* path);
+    /** Opens of @p path that went on to the C library so far: the probes
+     *  of devices that are not the simulated one. */
+    static std::size_t passedOnOpens(const std::string& path);
     static int open();
     static bool owns(int fd);
     static int ioctl(int fd, unsigned long request, void* argument);

@@ -1,5 +1,7 @@
 #include "RawBmc.h"
 
+#include "ipmi/IpmiError.h"
+
 #include <algorithm>
 
 namespace inbandsim
@@ -8,12 +10,7 @@ namespace inbandsim
 namespace
 {
 
-constexpr std::uint8_t ok = 0x00;
-constexpr std::uint8_t invalidCommand = 0xC1;
-constexpr std::uint8_t reservationCancelled = 0xC5;
-constexpr std::uint8_t lengthInvalid = 0xC7;
-constexpr std::uint8_t notPresent = 0xCB;
-constexpr std::uint8_t invalidField = 0xCC;
+using namespace QX::Ipmi; // the completion codes
 
 void put16(std::vector<std::uint8_t>& out, unsigned value)
 {
@@ -37,15 +34,15 @@ std::vector<std::uint8_t> deviceId()
     // Device 20h revision 1, firmware 1.02, IPMI 2.0; SEL, SDR repository
     // and chassis device; manufacturer and product ids of an unnamed
     // server.
-    return {ok,   0x20, 0x01, 0x01, 0x02, 0x02, 0x8D,
-            0x00, 0x00, 0x00, 0x01, 0x00, 0x00, 0x00};
+    return {completionOk, 0x20, 0x01, 0x01, 0x02, 0x02, 0x8D,
+            0x00,         0x00, 0x00, 0x01, 0x00, 0x00, 0x00};
 }
 
 std::vector<std::uint8_t> sdrRepositoryInfo()
 {
     // SDR version 51h, no records, free space 0, no timestamps, support:
     // non-modal update, reserve supported.
-    std::vector<std::uint8_t> out{ok, 0x51};
+    std::vector<std::uint8_t> out{completionOk, 0x51};
     put16(out, 0);
     put16(out, 0);
     put32(out, 0);
@@ -68,22 +65,22 @@ std::vector<std::uint8_t> RawBmc::answer(std::uint8_t netFn,
     {
         if (!restartCause)
         {
-            return {invalidCommand};
+            return {completionInvalidCommand};
         }
-        return {ok, *restartCause, 0x00};
+        return {completionOk, *restartCause, 0x00};
     }
     if (netFn != netFnStorage)
     {
-        return {invalidCommand};
+        return {completionInvalidCommand};
     }
     switch (command)
     {
         case 0x20: // Get SDR Repository Info
             return sdrRepositoryInfo();
         case 0x22: // Reserve SDR Repository
-            return {ok, 0x01, 0x00};
+            return {completionOk, 0x01, 0x00};
         case 0x23: // Get SDR: the repository is empty
-            return {notPresent};
+            return {completionRecordNotPresent};
         case 0x40:
             return selInfo();
         case 0x42:
@@ -93,7 +90,7 @@ std::vector<std::uint8_t> RawBmc::answer(std::uint8_t netFn,
             {
                 reservation_ = 1;
             }
-            std::vector<std::uint8_t> out{ok};
+            std::vector<std::uint8_t> out{completionOk};
             put16(out, reservation_);
             return out;
         }
@@ -105,18 +102,18 @@ std::vector<std::uint8_t> RawBmc::answer(std::uint8_t netFn,
             return clear(data);
         case 0x48: // Get SEL Time
         {
-            std::vector<std::uint8_t> out{ok};
+            std::vector<std::uint8_t> out{completionOk};
             put32(out, clock_);
             return out;
         }
         default:
-            return {invalidCommand};
+            return {completionInvalidCommand};
     }
 }
 
 std::vector<std::uint8_t> RawBmc::selInfo() const
 {
-    std::vector<std::uint8_t> out{ok, 0x51};
+    std::vector<std::uint8_t> out{completionOk, 0x51};
     put16(out, static_cast<unsigned>(sel_.size()));
     const std::size_t freeRecords =
         capacity > sel_.size() ? capacity - sel_.size() : 0;
@@ -139,18 +136,18 @@ RawBmc::selEntry(const std::vector<std::uint8_t>& data)
 {
     if (data.size() != 6)
     {
-        return {lengthInvalid};
+        return {completionRequestLengthInvalid};
     }
     if (!reserved(data))
     {
-        return {reservationCancelled};
+        return {completionReservationCancelled};
     }
     const unsigned wanted = get16(data, 2);
     const unsigned offset = data[4];
     const unsigned length = data[5] == 0xFF ? 16 : data[5];
     if (offset + length > 16)
     {
-        return {invalidField};
+        return {completionInvalidDataField};
     }
     std::size_t at = sel_.size();
     if (wanted == 0x0000 && !sel_.empty())
@@ -173,9 +170,9 @@ RawBmc::selEntry(const std::vector<std::uint8_t>& data)
     }
     if (at == sel_.size())
     {
-        return {notPresent};
+        return {completionRecordNotPresent};
     }
-    std::vector<std::uint8_t> out{ok};
+    std::vector<std::uint8_t> out{completionOk};
     put16(out,
           at + 1 < sel_.size()
               ? static_cast<unsigned>(sel_[at + 1][0] | sel_[at + 1][1] << 8)
@@ -201,7 +198,7 @@ RawBmc::addEntry(const std::vector<std::uint8_t>& data)
 {
     if (data.size() != 16)
     {
-        return {lengthInvalid};
+        return {completionRequestLengthInvalid};
     }
     if (sel_.size() >= capacity)
     {
@@ -209,7 +206,7 @@ RawBmc::addEntry(const std::vector<std::uint8_t>& data)
     }
     Record record{};
     std::copy(data.begin(), data.end(), record.begin());
-    std::vector<std::uint8_t> out{ok};
+    std::vector<std::uint8_t> out{completionOk};
     put16(out, add(record));
     return out;
 }
@@ -218,15 +215,15 @@ std::vector<std::uint8_t> RawBmc::clear(const std::vector<std::uint8_t>& data)
 {
     if (data.size() != 6)
     {
-        return {lengthInvalid};
+        return {completionRequestLengthInvalid};
     }
     if (get16(data, 0) != reservation_ || reservation_ == 0)
     {
-        return {reservationCancelled};
+        return {completionReservationCancelled};
     }
     if (data[2] != 'C' || data[3] != 'L' || data[4] != 'R')
     {
-        return {invalidField};
+        return {completionInvalidDataField};
     }
     if (data[5] == 0xAA)
     {
@@ -235,9 +232,9 @@ std::vector<std::uint8_t> RawBmc::clear(const std::vector<std::uint8_t>& data)
     }
     else if (data[5] != 0x00)
     {
-        return {invalidField};
+        return {completionInvalidDataField};
     }
-    return {ok, 0x01}; // erasure completed
+    return {completionOk, 0x01}; // erasure completed
 }
 
 } // namespace inbandsim

@@ -6,7 +6,7 @@
  *   state=PATH     the SEL file: read at start, rewritten after every
  *                  change (one record per line as 16 hex pairs, plus the
  *                  id counter and the two times). Required.
- *   max=N          capacity in records (default 64, at most 1024).
+ *   max=N          capacity in records (default 64, at most 8192).
  *   ring=1         a full SEL overwrites its oldest record: the count
  *                  stays at max and record ids go round 1..max, reused.
  *                  Without it a full SEL refuses new records (C4h).
@@ -21,6 +21,9 @@
  *   reserve=CC     Reserve SEL answers completion code CC (C1h: command
  *                  not supported, D4h: insufficient privilege); every
  *                  reservation id is then accepted.
+ *   delay-ms=N     every SEL command is answered N ms late, as over a
+ *                  LAN to a real BMC (default 0). The simulator's event
+ *                  loop waits meanwhile, as a BMC's one handler would.
  *
  * Records are added with Add SEL Entry (ipmitool "sel add", FreeIPMI raw)
  * or with the console command "sel_behaviour_add <16 bytes>"; for record
@@ -37,8 +40,10 @@
 #include <OpenIPMI/lanserv.h>
 #include <OpenIPMI/mcserv.h>
 #include <OpenIPMI/serv.h>
+#include <errno.h>
 #include <stdio.h>
 #include <string.h>
+#include <time.h>
 
 static int reservation_valid(unsigned reservation)
 {
@@ -50,6 +55,27 @@ static void answer(unsigned char* rdata, unsigned int* rdata_len,
 {
     rdata[0] = code;
     *rdata_len = 1;
+}
+
+/* Brings the SEL up to date for a request that needs @p min_len data
+ * bytes; answers C7h and returns 0 when it has fewer, and answers 81h and
+ * returns 0 during an erase when @p refused_while_erasing. */
+static int request_fits(const msg_t* msg, unsigned min_len,
+                        int refused_while_erasing, unsigned char* rdata,
+                        unsigned int* rdata_len)
+{
+    selb_settle();
+    if (msg->len < min_len)
+    {
+        answer(rdata, rdata_len, CC_REQUEST_LENGTH);
+        return 0;
+    }
+    if (refused_while_erasing && selb_state.erasing)
+    {
+        answer(rdata, rdata_len, CC_ERASE_IN_PROGRESS);
+        return 0;
+    }
+    return 1;
 }
 
 static void get_sel_info(lmc_data_t* mc, msg_t* msg, unsigned char* rdata,
@@ -136,15 +162,8 @@ static void get_sel_entry(lmc_data_t* mc, msg_t* msg, unsigned char* rdata,
     int index;
     (void)mc;
     (void)cb_data;
-    selb_settle();
-    if (msg->len < 6)
+    if (!request_fits(msg, 6, 1, rdata, rdata_len))
     {
-        answer(rdata, rdata_len, CC_REQUEST_LENGTH);
-        return;
-    }
-    if (selb_state.erasing)
-    {
-        answer(rdata, rdata_len, CC_ERASE_IN_PROGRESS);
         return;
     }
     if (ipmi_get_uint16(msg->data) != 0 &&
@@ -184,15 +203,8 @@ static void add_sel_entry(lmc_data_t* mc, msg_t* msg, unsigned char* rdata,
     unsigned id;
     (void)mc;
     (void)cb_data;
-    selb_settle();
-    if (msg->len < RECORD_SIZE)
+    if (!request_fits(msg, RECORD_SIZE, 1, rdata, rdata_len))
     {
-        answer(rdata, rdata_len, CC_REQUEST_LENGTH);
-        return;
-    }
-    if (selb_state.erasing)
-    {
-        answer(rdata, rdata_len, CC_ERASE_IN_PROGRESS);
         return;
     }
     id = selb_append(msg->data);
@@ -212,10 +224,8 @@ static void clear_sel(lmc_data_t* mc, msg_t* msg, unsigned char* rdata,
 {
     (void)mc;
     (void)cb_data;
-    selb_settle();
-    if (msg->len < 6)
+    if (!request_fits(msg, 6, 0, rdata, rdata_len))
     {
-        answer(rdata, rdata_len, CC_REQUEST_LENGTH);
         return;
     }
     if (msg->data[2] != 'C' || msg->data[3] != 'L' || msg->data[4] != 'R' ||
@@ -326,18 +336,38 @@ int ipmi_sim_module_print_version(sys_data_t* sys, char* options)
     return 0;
 }
 
+struct sel_command
+{
+    unsigned char cmd;
+    cmd_handler_f handler;
+};
+
+static struct sel_command sel_commands[] = {
+    {0x40, get_sel_info},  {0x41, not_supported}, {0x42, reserve_sel},
+    {0x43, get_sel_entry}, {0x44, add_sel_entry}, {0x45, not_supported},
+    {0x46, not_supported}, {0x47, clear_sel},     {0x48, get_sel_time},
+    {0x49, set_sel_time},
+};
+
+/* Every SEL command comes here: the delay, then its handler. */
+static void delayed(lmc_data_t* mc, msg_t* msg, unsigned char* rdata,
+                    unsigned int* rdata_len, void* cb_data)
+{
+    const struct sel_command* command = cb_data;
+    if (selb_state.delay_ms != 0)
+    {
+        struct timespec pause;
+        pause.tv_sec = selb_state.delay_ms / 1000;
+        pause.tv_nsec = (long)(selb_state.delay_ms % 1000) * 1000000L;
+        while (nanosleep(&pause, &pause) != 0 && errno == EINTR)
+        {
+        }
+    }
+    command->handler(mc, msg, rdata, rdata_len, NULL);
+}
+
 int ipmi_sim_module_init(sys_data_t* sys, char* options)
 {
-    static const struct
-    {
-        unsigned char cmd;
-        cmd_handler_f handler;
-    } commands[] = {
-        {0x40, get_sel_info},  {0x41, not_supported}, {0x42, reserve_sel},
-        {0x43, get_sel_entry}, {0x44, add_sel_entry}, {0x45, not_supported},
-        {0x46, not_supported}, {0x47, clear_sel},     {0x48, get_sel_time},
-        {0x49, set_sel_time},
-    };
     unsigned i;
     (void)sys;
     memset(&selb_state, 0, sizeof selb_state);
@@ -351,14 +381,14 @@ int ipmi_sim_module_init(sys_data_t* sys, char* options)
     selb_state.next_id = 1;
     selb_state.reservation = 1;
     selb_load();
-    for (i = 0; i < sizeof commands / sizeof commands[0]; ++i)
+    for (i = 0; i < sizeof sel_commands / sizeof sel_commands[0]; ++i)
     {
         const int rv = ipmi_emu_register_cmd_handler(
-            STORAGE_NETFN, commands[i].cmd, commands[i].handler, NULL);
+            STORAGE_NETFN, sel_commands[i].cmd, delayed, &sel_commands[i]);
         if (rv)
         {
             fprintf(stderr, "sel module: cannot register 0x%02x: %d\n",
-                    commands[i].cmd, rv);
+                    sel_commands[i].cmd, rv);
             return rv;
         }
     }

@@ -275,6 +275,10 @@ static int apply_option(const char* key, const char* value)
     {
         selb_state.clear_ms = (unsigned)number;
     }
+    else if (strcmp(key, "delay-ms") == 0)
+    {
+        selb_state.delay_ms = (unsigned)number;
+    }
     else if (strcmp(key, "clear-record") == 0)
     {
         selb_state.clear_record = number != 0;

@@ -11,7 +11,7 @@
 
 #pragma GCC visibility push(hidden)
 
-#define MAX_CAPACITY 1024
+#define MAX_CAPACITY 8192
 #define RECORD_SIZE 16
 #define STORAGE_NETFN 0x0a
 
@@ -33,6 +33,7 @@ struct sel_state
     int ring;
     int frozen;
     unsigned clear_ms;
+    unsigned delay_ms; /* every SEL command answered this much later */
     int clear_record;
     unsigned reserve_cc;
     unsigned next_id; /* without ring: the next id given out */
