@@ -3,6 +3,7 @@
 // provider library and the in-process broker.
 #include "CVLogger.h"
 #include "Fixture.h"
+#include "FixtureGenerator.h"
 #include "Host.h"
 #include "Instrumentation.h"
 #include "MemorySource.h"

@@ -19,6 +19,7 @@
 #include "AllocationCounter.h"
 #include "CVLogger.h"
 #include "Fixture.h"
+#include "FixtureGenerator.h"
 #include "Host.h"
 #include "MemorySource.h"
 #include "Platform.h"

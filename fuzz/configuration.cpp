@@ -1,6 +1,6 @@
 // The platform configuration reader on arbitrary text: it gives settings
 // within their ranges or reports the line with a std::runtime_error.
-#include "Platform.h"
+#include "Configuration.h"
 
 #include <cstdint>
 #include <cstdlib>

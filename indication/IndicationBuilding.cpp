@@ -4,8 +4,10 @@
 #include "CmpiValues.h"
 #include "IndicationTrace.h"
 #include "Instrumentation.h"
+#include "Product.h"
 #include "Resources.h"
 #include "Support.h"
+#include "Utf8.h"
 
 #include <cwchar>
 #include <exception>

@@ -40,6 +40,7 @@ constexpr std::size_t timestampBufferSize = 64;
 /** What follows the date and time digits of an entry's CIM timestamp. */
 constexpr std::string_view cimTimestampTail = ".000000+000";
 
+// Callers pass fixed line numbers on purpose: trace lines stay as they are.
 void traceEdge(const char* function, int line, MessageType type)
 {
     logFunctionEdge(function, unitFile, line, loggerSEL, type);

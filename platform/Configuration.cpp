@@ -3,7 +3,7 @@
  * and defaults, are described in docs/configuration.md; the ipmi.* keys are
  * read by platform/ipmi/IpmiSettings.cpp.
  */
-#include "Platform.h"
+#include "Configuration.h"
 
 #include <cerrno>
 #include <cstdlib>

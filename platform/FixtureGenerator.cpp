@@ -1,4 +1,5 @@
-#include "Fixture.h"
+#include "FixtureGenerator.h"
+
 #include "NodeLexicon.h"
 #include "ipmi/SelRecord.h"
 

@@ -1,3 +1,5 @@
+#include "ObjectPathCompare.h"
+
 #include "Support.h"
 
 #include <cmpift.h>

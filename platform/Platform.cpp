@@ -1,6 +1,7 @@
 #include "Platform.h"
 
 #include "CVLogger.h"
+#include "Configuration.h"
 #include "FailureReport.h"
 #include "Fixture.h"
 #include "MemorySource.h"

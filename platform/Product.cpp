@@ -1,5 +1,5 @@
-#include "ProductIdentity.h"
-#include "Resources.h"
+#include "Product.h"
+
 #include "Support.h"
 
 #include <fstream>

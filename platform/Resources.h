@@ -64,19 +64,4 @@ class ResourceString
     std::wstring text_;
 };
 
-/** UTF-8 form of a wide text (up to its first NUL for the pointer form). */
-std::string make_string(const std::wstring& text);
-std::string make_string(const wchar_t* text);
-
-namespace Product
-{
-
-/** Stable identity of this system as a UUID text
- *  (xxxxxxxx-xxxx-xxxx-xxxx-xxxxxxxxxxxx, lower case): from the DMI
- *  product UUID when readable, else from /etc/machine-id; all zeros when
- *  neither can be read. */
-std::wstring getUid();
-
-} // namespace Product
-
 } // namespace QX

@@ -1,4 +1,4 @@
-#include "Resources.h"
+#include "Utf8.h"
 
 #include <cstdint>
 

@@ -1,4 +1,5 @@
 #include "CmpiValues.h"
+#include "ObjectPathCompare.h"
 #include "ProviderTrace.h"
 #include "SELObjectFactory.h"
 #include "SELProvider.h"

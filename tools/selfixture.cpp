@@ -1,7 +1,7 @@
 // selfixture: writes a fixture file of a generated SEL (one controller, one
 // log, N entries) to standard output, for large-log runs of selprov and the
 // benchmarks.
-#include "Fixture.h"
+#include "FixtureGenerator.h"
 
 #include <charconv>
 #include <iostream>

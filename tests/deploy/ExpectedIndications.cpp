@@ -1,13 +1,13 @@
 #include "ExpectedIndications.h"
 
 #include "CVLogger.h"
+#include "EntryFixture.h"
 #include "Host.h"
 #include "MemorySource.h"
 #include "NodeTree.h"
 #include "Platform.h"
 #include "ProvidedInstances.h"
 #include "SelClasses.h"
-#include "entry/EntryFixture.h"
 
 #include <chrono>
 #include <memory>

@@ -2,11 +2,11 @@
 
 #include "CVLogger.h"
 #include "DeployFiles.h"
+#include "EntryFixture.h"
 #include "MemorySource.h"
 #include "NodeTree.h"
 #include "Platform.h"
 #include "SelClasses.h"
-#include "entry/EntryFixture.h"
 
 namespace deploy
 {

@@ -1,13 +1,13 @@
 // selprovider-register run as a user runs it, against stand-ins for the
 // SFCB and OpenPegasus tools that record their calls and keep the state
 // the real tools would change (staged files, registered modules).
+#include "ChildProcess.h"
+
 #include <array>
-#include <cstdio>
 #include <filesystem>
 #include <fstream>
 #include <sstream>
 #include <string>
-#include <sys/wait.h>
 #include <unistd.h>
 #include <vector>
 
@@ -206,22 +206,15 @@ class RegisterScript : public ::testing::Test
             " /bin/bash " + SELPROV_SOURCE_DIR +
             "/tools/selprovider-register --data-dir " + data() + " " +
             arguments + " 2>" + (root_ / "stderr").string();
+        const testsupport::CommandRun shell =
+            testsupport::runCommand("timeout 60 " + command);
         ScriptRun result;
-        // The script runs through the shell, as an administrator runs it.
-        // NOLINTNEXTLINE(cert-env33-c)
-        FILE* pipe = ::popen(("timeout 60 " + command).c_str(), "r");
-        if (pipe == nullptr)
+        if (!shell.started)
         {
             return result;
         }
-        std::array<char, 4096> buffer{};
-        std::size_t n = 0;
-        while ((n = std::fread(buffer.data(), 1, buffer.size(), pipe)) > 0)
-        {
-            result.out.append(buffer.data(), n);
-        }
-        const int status = ::pclose(pipe);
-        result.exitCode = WIFEXITED(status) ? WEXITSTATUS(status) : -1;
+        result.exitCode = shell.exitCode;
+        result.out = shell.output;
         result.err = readFile(root_ / "stderr");
         return result;
     }

@@ -5,6 +5,7 @@
 // platform that cannot be set up at all fails a subscription's watch with
 // a line in the log as well.
 #include "CaptureSink.h"
+#include "Configuration.h"
 #include "EntryFixture.h"
 #include "SelClasses.h"
 

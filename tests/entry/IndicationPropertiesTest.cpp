@@ -1,8 +1,10 @@
 // Each of the four indication classes, delivered through the loaded
 // library: every property by name, CMPI type and value, in the order set.
 #include "IndicationFixture.h"
+#include "Product.h"
 #include "Resources.h"
 #include "Support.h"
+#include "Utf8.h"
 
 #include <cstdint>
 #include <string>

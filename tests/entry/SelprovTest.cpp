@@ -1,46 +1,25 @@
 // selprov, the main job's command, run as a user runs it: a separate
 // process on the shipped sample SEL or on a fixture named by --config.
-#include <array>
-#include <cstdio>
+#include "ChildProcess.h"
+
 #include <filesystem>
 #include <fstream>
 #include <string>
-#include <sys/wait.h>
+#include <unistd.h>
 
 #include <gtest/gtest.h>
 
 namespace
 {
 
-struct CommandResult
-{
-    int exitCode = -1;
-    std::string output;
-};
+using CommandResult = testsupport::CommandRun;
 
 /** Runs a shell command line with a bounded run time; captures standard
  *  output (and standard error when @p withErrors). */
 CommandResult run(const std::string& commandLine, bool withErrors = false)
 {
-    const std::string full =
-        "timeout 240 " + commandLine + (withErrors ? " 2>&1" : " 2>/dev/null");
-    CommandResult result;
-    // The shell runs the tool as a user would, with its output redirected.
-    // NOLINTNEXTLINE(cert-env33-c)
-    FILE* pipe = ::popen(full.c_str(), "r");
-    if (pipe == nullptr)
-    {
-        return result;
-    }
-    std::array<char, 4096> buffer{};
-    std::size_t n = 0;
-    while ((n = std::fread(buffer.data(), 1, buffer.size(), pipe)) > 0)
-    {
-        result.output.append(buffer.data(), n);
-    }
-    const int status = ::pclose(pipe);
-    result.exitCode = WIFEXITED(status) ? WEXITSTATUS(status) : -1;
-    return result;
+    return testsupport::runCommand("timeout 240 " + commandLine +
+                                   (withErrors ? " 2>&1" : " 2>/dev/null"));
 }
 
 class Selprov : public ::testing::Test

@@ -1,9 +1,8 @@
 // The selprov command's exit codes for bad command lines and libraries that
 // cannot be loaded (neither needs a working provider).
-#include <array>
-#include <cstdio>
+#include "ChildProcess.h"
+
 #include <string>
-#include <sys/wait.h>
 #include <unistd.h>
 
 #include <gtest/gtest.h>
@@ -13,11 +12,7 @@ namespace hosttest
 namespace
 {
 
-struct CommandRun
-{
-    int exitCode = -1;
-    std::string output; // stdout and stderr together
-};
+using testsupport::CommandRun; // output: stdout and stderr together
 
 std::string selprovPath()
 {
@@ -30,24 +25,7 @@ std::string selprovPath()
 
 CommandRun run(const std::string& args)
 {
-    CommandRun r;
-    const std::string command = selprovPath() + " " + args + " 2>&1";
-    // The shell runs the tool as a user would, with its output redirected.
-    // NOLINTNEXTLINE(cert-env33-c)
-    FILE* pipe = popen(command.c_str(), "r");
-    if (pipe == nullptr)
-    {
-        return r;
-    }
-    std::array<char, 512> buf{};
-    std::size_t n = 0;
-    while ((n = fread(buf.data(), 1, buf.size(), pipe)) > 0)
-    {
-        r.output.append(buf.data(), n);
-    }
-    const int status = pclose(pipe);
-    r.exitCode = WIFEXITED(status) ? WEXITSTATUS(status) : -1;
-    return r;
+    return testsupport::runCommand(selprovPath() + " " + args + " 2>&1");
 }
 
 class SelprovCommand : public ::testing::Test

@@ -1,6 +1,7 @@
 #include "InbandFixture.h"
 
 #include "CVLogger.h"
+#include "Configuration.h"
 #include "Platform.h"
 #include "SelClasses.h"
 #include "SelRequests.h"

@@ -1,6 +1,7 @@
 #include "BmcFixture.h"
 
 #include "CVLogger.h"
+#include "ChildProcess.h"
 #include "Platform.h"
 #include "SelClasses.h"
 #include "SelRequests.h"
@@ -84,22 +85,12 @@ std::string BmcTest::ipmitool(const std::string& arguments) const
 {
     const std::string command =
         "TZ=UTC " + bmc_->ipmitool() + " " + arguments + " 2>&1";
-    // The shell runs ipmitool as a user would, with its output redirected.
-    // NOLINTNEXTLINE(cert-env33-c)
-    FILE* pipe = ::popen(command.c_str(), "r");
-    if (pipe == nullptr)
+    const testsupport::CommandRun run = testsupport::runCommand(command);
+    if (!run.started)
     {
         throw std::runtime_error("cannot run ipmitool");
     }
-    std::string output;
-    char buffer[4096];
-    std::size_t read = 0;
-    while ((read = std::fread(buffer, 1, sizeof buffer, pipe)) > 0)
-    {
-        output.append(buffer, read);
-    }
-    ::pclose(pipe);
-    return output;
+    return run.output;
 }
 
 std::vector<IpmitoolRecord> BmcTest::ipmitoolRecords() const

@@ -3,8 +3,7 @@
 // session object, as after a new provider load) go straight to 3.
 
 #include "BmcFixture.h"
-#include "SimulatedBmc.h"
-#include "ipmi/IpmiSession.h"
+#include "SessionFixture.h"
 
 #include <filesystem>
 #include <fstream>
@@ -26,38 +25,25 @@ std::string firstLine(const std::string& path)
     return line;
 }
 
-class CipherSuiteTest : public ::testing::Test
+class CipherSuiteTest : public bmctest::SessionTest
 {
   protected:
     void SetUp() override
     {
-        if (!bmcsim::SimulatedBmc::available())
+        SessionTest::SetUp();
+        if (bmc)
         {
-            GTEST_SKIP() << "ipmi_sim is not installed (Debian package "
-                            "openipmi): the BMC simulator tests are skipped";
+            stateDirectory = bmc->directory() + "/cipher-state";
         }
-        bmc = std::make_unique<bmcsim::SimulatedBmc>(bmcsim::Options{});
-        bmc->start();
-        stateDirectory = bmc->directory() + "/cipher-state";
     }
 
     SessionParameters parameters() const
     {
-        SessionParameters p;
-        p.lan = true;
-        p.host = bmc->host();
-        p.user = "admin";
-        p.password = "password";
-        p.privilege = IPMI_PRIVILEGE_LEVEL_ADMIN;
+        SessionParameters p = SessionTest::parameters();
         p.cipherSuite = 0; // must not be what decides
-        p.sessionTimeoutMs = 1000;
-        p.retransmissionTimeoutMs = 200;
-        p.workaroundFlags =
-            IPMI_WORKAROUND_FLAGS_OUTOFBAND_2_0_OPEN_SESSION_PRIVILEGE;
         return p;
     }
 
-    std::unique_ptr<bmcsim::SimulatedBmc> bmc;
     std::string stateDirectory;
 };
 

@@ -1,8 +1,7 @@
 // The FreeIPMI session on the simulated BMC: reuse, reopening after idle
 // time, and the error categories of real failures.
 
-#include "SimulatedBmc.h"
-#include "ipmi/IpmiSession.h"
+#include "SessionFixture.h"
 
 #include <chrono>
 #include <thread>
@@ -34,37 +33,7 @@ std::chrono::steady_clock::duration failedSelInfo(IpmiSession& session,
     return std::chrono::steady_clock::now() - began;
 }
 
-class SessionTest : public ::testing::Test
-{
-  protected:
-    void SetUp() override
-    {
-        if (!bmcsim::SimulatedBmc::available())
-        {
-            GTEST_SKIP() << "ipmi_sim is not installed (Debian package "
-                            "openipmi): the BMC simulator tests are skipped";
-        }
-        bmc = std::make_unique<bmcsim::SimulatedBmc>(bmcsim::Options{});
-        bmc->start();
-    }
-
-    SessionParameters parameters(unsigned timeoutMs = 1000) const
-    {
-        SessionParameters p;
-        p.lan = true;
-        p.host = bmc->host();
-        p.user = "admin";
-        p.password = "password";
-        p.privilege = IPMI_PRIVILEGE_LEVEL_ADMIN;
-        p.sessionTimeoutMs = timeoutMs;
-        p.retransmissionTimeoutMs = 200;
-        p.workaroundFlags =
-            IPMI_WORKAROUND_FLAGS_OUTOFBAND_2_0_OPEN_SESSION_PRIVILEGE;
-        return p;
-    }
-
-    std::unique_ptr<bmcsim::SimulatedBmc> bmc;
-};
+using bmctest::SessionTest;
 
 TEST_F(SessionTest, OneSessionServesBackToBackExchanges)
 {

@@ -2,7 +2,7 @@
 
 // Configuration texts and files for the platform tests.
 
-#include "Platform.h"
+#include "Configuration.h"
 
 #include <cstdio>
 #include <fstream>

@@ -1,5 +1,6 @@
 #include "Fixture.h"
 
+#include "FixtureGenerator.h"
 #include "Instrumentation.h"
 #include "MemorySource.h"
 

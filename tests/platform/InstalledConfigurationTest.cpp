@@ -1,6 +1,7 @@
 // The platform configuration that the package installs as
 // /etc/qx/platform.conf: valid, equal to the defaults that apply without
 // it, and every key it shows commented out a valid setting of its own.
+#include "Configuration.h"
 #include "Platform.h"
 
 #include <fstream>

@@ -1,6 +1,7 @@
 #include "Instrumentation.h"
 
 #include "Fixture.h"
+#include "FixtureGenerator.h"
 #include "MemorySource.h"
 #include "platform/TestTrees.h"
 

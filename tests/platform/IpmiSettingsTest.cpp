@@ -1,4 +1,5 @@
 #include "CVLogger.h"
+#include "Configuration.h"
 #include "Platform.h"
 #include "ipmi/IpmiSourceFactory.h"
 #include "platform/CapturedLog.h"

@@ -1,4 +1,4 @@
-#include "Support.h"
+#include "ObjectPathCompare.h"
 
 #include <cmpift.h>
 

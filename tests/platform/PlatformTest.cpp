@@ -1,6 +1,7 @@
 #include "Platform.h"
 
 #include "CVLogger.h"
+#include "Configuration.h"
 #include "Instrumentation.h"
 #include "MemorySource.h"
 #include "Resources.h"

@@ -1,6 +1,7 @@
 #include "Resources.h"
 
-#include "ProductIdentity.h"
+#include "Product.h"
+#include "Utf8.h"
 #include "platform/EnvironmentGuard.h"
 
 #include <gmock/gmock.h>

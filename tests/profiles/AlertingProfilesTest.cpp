@@ -3,6 +3,7 @@
 // exactly one clear event, a fill transition exactly one full event, and
 // nothing is announced that did not happen.
 
+#include "ClearAndSlowProfiles.h"
 #include "ProfileFixture.h"
 
 #include <iostream>
@@ -33,15 +34,32 @@ class AlertingProfilesTest : public ProfileTest
         expectEntryEvents(events, fresh);
         EXPECT_EQ(events.size(), fresh.size()) << "more than entry events";
     }
+
+    /** Starts the BMC of @p profile with @p records records and subscribes
+     *  to every indication class. */
+    void startSubscribed(const BmcProfile& profile, unsigned records)
+    {
+        start(profile);
+        addRecords(records);
+        subscribeAll();
+    }
+
+    /** Clears the SEL through ClearLog and checks that exactly one clear
+     *  event, and nothing else, is announced. */
+    void expectClearIsOneClearEvent()
+    {
+        ASSERT_EQ(clearLog().rc, CMPI_RC_OK);
+        const auto events = settle();
+        ASSERT_EQ(events.size(), 1u);
+        EXPECT_EQ(events[0].instance.path.className, clearEvent);
+    }
 };
 
 } // namespace
 
 TEST_F(AlertingProfilesTest, FrozenRingBufferAnnouncesEveryNewRecord)
 {
-    start(frozenRing(16));
-    addRecords(16);
-    subscribeAll();
+    startSubscribed(frozenRing(16), 16);
     addAndExpectEntryEvents(3);
     addAndExpectEntryEvents(5);
     addAndExpectEntryEvents(1);
@@ -52,9 +70,7 @@ TEST_F(AlertingProfilesTest, RingBufferWrappingIdsGiveNoClear)
 {
     BmcProfile profile = frozenRing(16);
     profile.lastId = 20;
-    start(profile);
-    addRecords(16);
-    subscribeAll();
+    startSubscribed(profile, 16);
     // Every record of the SEL replaced, ids used again: no clear.
     for (int round = 0; round < 4; ++round)
     {
@@ -67,9 +83,7 @@ TEST_F(AlertingProfilesTest, RolloverRecordIsOneFullEvent)
     BmcProfile profile = frozenRing(16);
     profile.rolloverRecord = true;
     profile.freeSpace = FreeSpaceAnswer::AlwaysFFFF;
-    start(profile);
-    addRecords(10);
-    subscribeAll();
+    startSubscribed(profile, 10);
     const auto before = bmc->truth();
     addRecords(8); // fills the ring: the BMC logs "SEL full"
     const auto events = settle();
@@ -86,9 +100,7 @@ TEST_F(AlertingProfilesTest, TwoRecordsInOneSecondAreTwoEvents)
 {
     BmcProfile profile;
     profile.additionIsNewestTime = true;
-    start(profile);
-    addRecords(2);
-    subscribeAll();
+    startSubscribed(profile, 2);
     const auto before = bmc->truth();
     bmc->add(QX::test::eventBody(700), 0x66000000);
     bmc->add(QX::test::eventBody(701), 0x66000000);
@@ -100,13 +112,8 @@ TEST_F(AlertingProfilesTest, ClearWithUnsetEraseTimeIsOneClearEvent)
 {
     BmcProfile profile;
     profile.eraseTimeUnset = true;
-    start(profile);
-    addRecords(5);
-    subscribeAll();
-    ASSERT_EQ(clearLog().rc, CMPI_RC_OK);
-    const auto events = settle();
-    ASSERT_EQ(events.size(), 1u);
-    EXPECT_EQ(events[0].instance.path.className, clearEvent);
+    startSubscribed(profile, 5);
+    expectClearIsOneClearEvent();
 }
 
 TEST_F(AlertingProfilesTest, ClearByAnotherProgramWithFrozenTimes)
@@ -114,9 +121,7 @@ TEST_F(AlertingProfilesTest, ClearByAnotherProgramWithFrozenTimes)
     BmcProfile profile;
     profile.frozenTimestamps = true;
     profile.clearedRecordAfterErase = true;
-    start(profile);
-    addRecords(5);
-    subscribeAll();
+    startSubscribed(profile, 5);
     bmc->clearByOther();
     const auto events = settle();
     // The "log cleared" record is new too.
@@ -128,13 +133,7 @@ TEST_F(AlertingProfilesTest, ClearByAnotherProgramWithFrozenTimes)
 
 TEST_F(AlertingProfilesTest, BackgroundClearIsOneClearEvent)
 {
-    BmcProfile profile;
-    profile.eraseTakes = std::chrono::milliseconds(800);
-    profile.eraseCancelsReservation = true;
-    profile.clearedRecordAfterErase = true;
-    start(profile);
-    addRecords(6);
-    subscribeAll();
+    startSubscribed(backgroundClear(std::chrono::milliseconds(800)), 6);
     ASSERT_EQ(clearLog().rc, CMPI_RC_OK);
     const auto events = settle();
     EXPECT_EQ(ofClass(events, clearEvent).size(), 1u);
@@ -147,9 +146,7 @@ TEST_F(AlertingProfilesTest, IdRestartWithoutEraseIsNoClear)
     BmcProfile profile;
     profile.frozenTimestamps = true;
     profile.firstId = 5001;
-    start(profile);
-    addRecords(4);
-    subscribeAll();
+    startSubscribed(profile, 4);
     bmc->restartIds();
     addAndExpectEntryEvents(3);
 }
@@ -159,9 +156,7 @@ TEST_F(AlertingProfilesTest, ReusedIdIsANewRecord)
     BmcProfile profile;
     profile.reuseDeletedIds = true;
     profile.frozenTimestamps = true;
-    start(profile);
-    addRecords(5);
-    subscribeAll();
+    startSubscribed(profile, 5);
     bmc->remove(2);
     EXPECT_TRUE(settle().empty()) << "a delete is neither entry nor clear";
     addAndExpectEntryEvents(1);
@@ -183,9 +178,7 @@ TEST_F(AlertingProfilesTest, FillRecordsAreTheFillSignalWhenFreeSpaceLies)
     BmcProfile profile;
     profile.freeSpace = FreeSpaceAnswer::AlwaysFFFF;
     profile.overflowNeverSet = true;
-    start(profile);
-    addRecords(3);
-    subscribeAll();
+    startSubscribed(profile, 3);
     bmc->add(QX::test::loggingDisabledBody(0x05)); // almost full
     auto events = settle();
     auto full = ofClass(events, fullEvent);
@@ -229,19 +222,12 @@ TEST_F(AlertingProfilesTest, RefusedReservationAndSdrTimeout)
     addRecords(3);
     subscribeAll();
     addAndExpectEntryEvents(3);
-    ASSERT_EQ(clearLog().rc, CMPI_RC_OK);
-    const auto events = settle();
-    ASSERT_EQ(events.size(), 1u);
-    EXPECT_EQ(events[0].instance.path.className, clearEvent);
+    expectClearIsOneClearEvent();
 }
 
 TEST_F(AlertingProfilesTest, SlowBmcAnnouncesEveryRecordOnce)
 {
-    BmcProfile profile;
-    profile.delay = std::chrono::milliseconds(20);
-    profile.slowEvery = 11;
-    profile.slowTakes = std::chrono::milliseconds(1200);
-    start(profile, 5000);
+    start(slowBmc(11, std::chrono::milliseconds(1200)), 5000);
     addRecords(4);
     subscribeAll();
     addAndExpectEntryEvents(3);
@@ -250,9 +236,7 @@ TEST_F(AlertingProfilesTest, SlowBmcAnnouncesEveryRecordOnce)
 
 TEST_F(AlertingProfilesTest, IdlePollCostsTwoRequests)
 {
-    start(frozenRing(16));
-    addRecords(16);
-    subscribeAll();
+    startSubscribed(frozenRing(16), 16);
     waitForPolls(2);
     const std::uint64_t requests = ipmi().requestCount();
     const std::uint64_t polls = ipmi().pollCount();

@@ -2,6 +2,7 @@
 // real ones do: every one equals the BMC's SEL (ids, bytes, order) and
 // ends in bounded time.
 
+#include "ClearAndSlowProfiles.h"
 #include "ProfileFixture.h"
 #include "ipmi/SelRecord.h"
 
@@ -207,11 +208,7 @@ TEST_F(ReadingProfilesTest, SdrTimingOutLeavesTheSelReadable)
 
 TEST_F(ReadingProfilesTest, SlowBmcStillAnswersInBoundedTime)
 {
-    BmcProfile profile;
-    profile.delay = std::chrono::milliseconds(20);
-    profile.slowEvery = 9;
-    profile.slowTakes = std::chrono::milliseconds(1500);
-    start(profile, 5000);
+    start(slowBmc(9, std::chrono::milliseconds(1500)), 5000);
     addRecords(20);
     const auto began = std::chrono::steady_clock::now();
     expectEnumerationIsTheSel();
@@ -224,11 +221,7 @@ TEST_F(ReadingProfilesTest, SlowBmcStillAnswersInBoundedTime)
 
 TEST_F(ReadingProfilesTest, BackgroundClearIsWaitedFor)
 {
-    BmcProfile profile;
-    profile.eraseTakes = std::chrono::milliseconds(1200);
-    profile.eraseCancelsReservation = true;
-    profile.clearedRecordAfterErase = true;
-    start(profile);
+    start(backgroundClear(std::chrono::milliseconds(1200)));
     addRecords(9);
     expectEnumerationIsTheSel();
     const auto began = std::chrono::steady_clock::now();

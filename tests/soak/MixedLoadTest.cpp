@@ -3,8 +3,8 @@
 // enabling, disabling and unsubscribing.
 #include "CVLogger.h"
 #include "SelClasses.h"
+#include "EntryFixture.h"
 #include "SoakSupport.h"
-#include "entry/EntryFixture.h"
 
 #include <atomic>
 #include <chrono>

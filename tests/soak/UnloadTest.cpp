@@ -3,8 +3,8 @@
 // dlclose, without disabling indications first.
 #include "CVLogger.h"
 #include "SelClasses.h"
+#include "EntryFixture.h"
 #include "SoakSupport.h"
-#include "entry/EntryFixture.h"
 
 #include <dlfcn.h>
 

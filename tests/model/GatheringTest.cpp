@@ -1,5 +1,5 @@
+#include "PlatformFixture.h"
 #include "SEL.h"
-#include "TestSupport.h"
 
 #include <gtest/gtest.h>
 

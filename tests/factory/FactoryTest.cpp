@@ -1,7 +1,7 @@
 #include "Broker.h"
+#include "PlatformFixture.h"
 #include "SELObjectFactory.h"
 #include "SelClasses.h"
-#include "TestSupport.h"
 
 #include <vector>
 

@@ -1,10 +1,20 @@
 #pragma once
 
-// Helpers behind QX::Product::getUid, visible for the unit tests.
-
 #include <optional>
 #include <string>
 
+namespace QX::Product
+{
+
+/** Stable identity of this system as a UUID text
+ *  (xxxxxxxx-xxxx-xxxx-xxxx-xxxxxxxxxxxx, lower case): from the DMI
+ *  product UUID when readable, else from /etc/machine-id; all zeros when
+ *  neither can be read. */
+std::wstring getUid();
+
+} // namespace QX::Product
+
+// Helpers behind getUid, visible for the unit tests.
 namespace QX::Product::detail
 {
 

@@ -2,9 +2,9 @@
 // counters, the watches they start and stop, and the saved context.
 #include "Broker.h"
 #include "Indication.h"
+#include "PlatformFixture.h"
 #include "SELIndication.h"
 #include "SelClasses.h"
-#include "TestSupport.h"
 
 #include <chrono>
 #include <cstdint>

@@ -1,7 +1,7 @@
 #include "sdk/qxlib/include/Trace.h"
 
+#include "PlatformFixture.h"
 #include "ProviderException.h"
-#include "TestSupport.h"
 
 #include <cstring>
 #include <limits>

@@ -1,4 +1,4 @@
-#include "TestSupport.h"
+#include "PlatformFixture.h"
 
 #include "CapturedLines.h"
 
