@@ -2,8 +2,8 @@
 // 1,000 simulated alerts fire and another thread keeps subscribing,
 // enabling, disabling and unsubscribing.
 #include "CVLogger.h"
-#include "SelClasses.h"
 #include "EntryFixture.h"
+#include "SelClasses.h"
 #include "SoakSupport.h"
 
 #include <atomic>

@@ -2,8 +2,8 @@
 // and alerts in flight, in an object manager's unload order: cleanup, then
 // dlclose, without disabling indications first.
 #include "CVLogger.h"
-#include "SelClasses.h"
 #include "EntryFixture.h"
+#include "SelClasses.h"
 #include "SoakSupport.h"
 
 #include <dlfcn.h>
